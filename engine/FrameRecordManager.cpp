@@ -1,0 +1,37 @@
+#include "engine/FrameRecordManager.h"
+
+#include <cstdio>
+
+namespace Tovra {
+
+FrameRecordManager::FrameRecordManager(size_t count) {
+  slots_.reserve(count);
+  for (size_t i = 0; i < count; ++i) slots_.push_back(std::make_shared<FrameRecord>());
+}
+
+std::shared_ptr<FrameRecord> FrameRecordManager::getNewSlot() {
+  std::lock_guard<std::mutex> lock(mutex_);
+  for (auto& slot : slots_) {
+    if (slot && slot.use_count() == 1) {
+      slot->frameId = nextFrameId_++;
+      slot->timeStamp = -1.0;
+      return slot;
+    }
+  }
+  return nullptr;
+}
+
+bool FrameRecordManager::restart() {
+  std::lock_guard<std::mutex> lock(mutex_);
+  for (auto& slot : slots_) {
+    if (slot && slot.use_count() != 1) {
+      std::puts("Unable to restart frame record manager () as some frame(s) are still outstanding");
+      return false;
+    }
+    slot = std::make_shared<FrameRecord>();
+  }
+  nextFrameId_ = 0;
+  return true;
+}
+
+}  // namespace Tovra

@@ -1,0 +1,61 @@
+#ifndef ORZAVS_TYPES_IMAGEBUFFER_H
+#define ORZAVS_TYPES_IMAGEBUFFER_H
+
+#include <cstdint>
+
+#include "types/ImageFormat.h"
+
+namespace OrzaVSMobile {
+
+// The pixels of one frame plus their geometry.
+//
+// Ownership: `allocLen` is the capacity every fill uses and marks the memory as owned. Memory
+// obtained through allocateBuffer() is owned by this buffer and freed by releaseBuffer() or the
+// destructor. Memory that the engine lends (requestImageBuffer) also carries a non-zero
+// `allocLen` so that the client can fill it, but it is never freed by this buffer: the buffer
+// remembers privately which block it allocated itself and frees only that one.
+//
+// Copies are deep for owned memory (the copy owns a duplicate) and shallow otherwise.
+struct ImageBuffer {
+  ImageFormat format;
+  int32_t definition;
+  int32_t width;
+  int32_t height;
+  int32_t widthStep;
+  int32_t numChannels;
+  uint8_t* data;
+  int32_t allocLen;
+
+  // NV21, everything else zero, no data.
+  ImageBuffer();
+  // Borrows `data` (allocLen 0). Note: `definition` comes first although `format` is stored first.
+  ImageBuffer(int32_t definition, ImageFormat format, int32_t width, int32_t height,
+              int32_t widthStep, int32_t numChannels, uint8_t* data);
+  ImageBuffer(const ImageBuffer& other);
+  ImageBuffer& operator=(const ImageBuffer& other);
+  ~ImageBuffer();
+
+  // Frees owned memory, then allocates `length` bytes and owns them. Returns `length`, or 0 when
+  // the allocation fails (negative lengths always fail); the buffer is then empty.
+  int32_t allocateBuffer(int32_t length);
+  // Gives up owned memory: allocLen becomes 0, `data` keeps its (now stale) value.
+  void releaseBuffer();
+  // Copies min(length, allocLen) bytes from `source` into `data`; returns the count copied.
+  int32_t fillBuffer(const uint8_t* source, int32_t length);
+  // Same as fillBuffer; the binding passes a direct byte buffer's memory.
+  int32_t fillBufferWithByteBuffer(const uint8_t* source, int32_t length);
+  // Two planes (luminance, then chroma) placed back to back; returns the total count copied.
+  int32_t fillBufferWithByteBuffer(const uint8_t* first, int32_t firstLength,
+                                   const uint8_t* second, int32_t secondLength);
+
+ private:
+  // Usable bytes at `data`: allocLen, bounded by the real size when `data` is our own block.
+  int32_t capacity() const;
+
+  uint8_t* owned_ = nullptr;  // the block allocateBuffer() made, if any
+  int32_t ownedLen_ = 0;
+};
+
+}  // namespace OrzaVSMobile
+
+#endif

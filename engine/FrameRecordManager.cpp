@@ -13,9 +13,14 @@ std::shared_ptr<FrameRecord> FrameRecordManager::getNewSlot() {
   std::lock_guard<std::mutex> lock(mutex_);
   for (auto& slot : slots_) {
     if (slot && slot.use_count() == 1) {
-      slot->frameId = nextFrameId_++;
-      slot->timeStamp = -1.0;
-      return slot;
+      // Take the new reference before touching the record. use_count() is a relaxed read;
+      // the increment of the copy is an acquire-release operation on the same counter, so it
+      // orders these writes after everything the thread that dropped the record last did
+      // with it (a job still reading frameId or the pixels just before letting go).
+      std::shared_ptr<FrameRecord> record = slot;
+      record->frameId = nextFrameId_++;
+      record->timeStamp = -1.0;
+      return record;
     }
   }
   return nullptr;

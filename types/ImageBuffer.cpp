@@ -18,13 +18,15 @@ ImageBuffer::ImageBuffer(int32_t def, ImageFormat fmt, int32_t w, int32_t h, int
 ImageBuffer::ImageBuffer(const ImageBuffer& other)
     : format(other.format), definition(other.definition), width(other.width),
       height(other.height), widthStep(other.widthStep), numChannels(other.numChannels),
-      data(other.data), allocLen(other.allocLen) {
-  // A copy of an owning buffer owns a duplicate of the bytes: two owners of one block would
-  // free it twice.
-  if (other.owned_ != nullptr && other.data == other.owned_ && other.allocLen != 0) {
+      data(other.data), allocLen(other.allocLen), lent_(other.lent_), lentLen_(other.lentLen_),
+      released_(other.released_) {
+  // A copy of a buffer that points at its own block owns a duplicate of the bytes: two owners
+  // of one block would free it twice, and a copy that merely pointed at the other's block
+  // would be left dangling when the other is released or destroyed.
+  if (other.owned_ != nullptr && other.data == other.owned_) {
     owned_ = new uint8_t[static_cast<size_t>(other.ownedLen_)];
     ownedLen_ = other.ownedLen_;
-    std::memcpy(owned_, other.owned_, static_cast<size_t>(ownedLen_));
+    if (ownedLen_ > 0) std::memcpy(owned_, other.owned_, static_cast<size_t>(ownedLen_));
     data = owned_;
   }
 }
@@ -42,17 +44,27 @@ ImageBuffer& ImageBuffer::operator=(const ImageBuffer& other) {
     std::swap(allocLen, copy.allocLen);
     std::swap(owned_, copy.owned_);
     std::swap(ownedLen_, copy.ownedLen_);
+    std::swap(lent_, copy.lent_);
+    std::swap(lentLen_, copy.lentLen_);
+    std::swap(released_, copy.released_);
   }
   return *this;
 }
 
 ImageBuffer::~ImageBuffer() { delete[] owned_; }
 
-int32_t ImageBuffer::allocateBuffer(int32_t length) {
-  releaseBuffer();
-  delete[] owned_;  // a zero-length block is owned too, though allocLen says 0
+void ImageBuffer::freeOwned() {
+  if (owned_ == nullptr) return;
+  delete[] owned_;
+  released_ = owned_;
   owned_ = nullptr;
   ownedLen_ = 0;
+}
+
+int32_t ImageBuffer::allocateBuffer(int32_t length) {
+  releaseBuffer();
+  // A zero-length block, or one whose allocLen the caller zeroed, is still ours to free.
+  freeOwned();
   // A negative length is a request for more than can ever be had: it fails like one.
   if (length < 0) return 0;
   uint8_t* block = new (std::nothrow) uint8_t[static_cast<size_t>(length)];
@@ -69,17 +81,31 @@ void ImageBuffer::releaseBuffer() {
   // Only the block this buffer allocated is freed. Memory lent by the engine also has a
   // non-zero allocLen, and a client (or Java) may have pointed `data` elsewhere; freeing
   // `data` blindly would free memory this buffer never owned.
-  delete[] owned_;
-  owned_ = nullptr;
-  ownedLen_ = 0;
+  freeOwned();
   allocLen = 0;
+}
+
+void ImageBuffer::lend(uint8_t* block, int32_t length) {
+  lent_ = block;
+  lentLen_ = (block != nullptr && length > 0) ? length : 0;
+  data = block;
+  allocLen = lentLen_;
+}
+
+int64_t ImageBuffer::knownLength() const {
+  if (data == nullptr) return 0;
+  if (owned_ != nullptr && data == owned_) return ownedLen_;
+  if (lent_ != nullptr && data == lent_) return lentLen_;
+  if (released_ != nullptr && data == released_) return 0;
+  return -1;
 }
 
 int32_t ImageBuffer::capacity() const {
   if (allocLen <= 0) return 0;
-  // When `data` is our own block, never trust allocLen beyond the block's real size: the Java
-  // side can set allocLen to anything.
-  if (owned_ != nullptr && data == owned_) return std::min(allocLen, ownedLen_);
+  // Never trust allocLen beyond the real size of a block this buffer knows: the Java side can
+  // set allocLen (and data) to anything.
+  const int64_t known = knownLength();
+  if (known >= 0) return static_cast<int32_t>(std::min<int64_t>(allocLen, known));
   return allocLen;
 }
 

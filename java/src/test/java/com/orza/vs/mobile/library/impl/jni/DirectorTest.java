@@ -1,0 +1,411 @@
+package com.orza.vs.mobile.library.impl.jni;
+
+import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertThrowsWithMessage;
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertFalse;
+import static org.junit.jupiter.api.Assertions.assertNotNull;
+import static org.junit.jupiter.api.Assertions.assertNotSame;
+import static org.junit.jupiter.api.Assertions.assertNull;
+import static org.junit.jupiter.api.Assertions.assertSame;
+import static org.junit.jupiter.api.Assertions.assertThrows;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+
+import java.lang.ref.WeakReference;
+import java.util.ArrayList;
+import java.util.Collections;
+import java.util.List;
+import org.junit.jupiter.api.Test;
+
+class DirectorTest {
+  /** Records every callback with its arguments and thread. */
+  static class Recorder extends EventDelegateBase {
+    final List<String> calls = Collections.synchronizedList(new ArrayList<String>());
+    volatile Thread lastThread;
+
+    private void record(String call) {
+      lastThread = Thread.currentThread();
+      calls.add(call);
+    }
+
+    @Override
+    public void didReceiveEvent(ObjectModuleID m, ContentType c, ActionID a, StatusID s) {
+      record("event " + m + " " + c + " " + a + " " + s);
+    }
+
+    @Override
+    public void didProcessFrame(ObjectModuleID m, StatusID s, long v64, int v32) {
+      record("frame " + m + " " + s + " " + v64 + " " + v32);
+    }
+
+    @Override
+    public void didDetect(VectorOfObjectInfo objects) {
+      record("detect " + objects.size());
+    }
+
+    @Override
+    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+      StringBuilder text = new StringBuilder("decode " + metadata.getQueryID());
+      for (ObjectInfo o : objects) {
+        text.append(' ').append(o.getContent()).append('/').append(o.getContentType())
+            .append('/').append(o.getLocation().size());
+      }
+      text.append(' ').append(metadata.getAccumulatedQueries());
+      record(text.toString());
+    }
+
+    @Override
+    public void didDetectInterestPoints(VectorOfPoint2f points) {
+      record("points " + points.size());
+    }
+
+    @Override
+    public void didReceiveServerError(ObjectModuleID m, ResponseStatus s, int code) {
+      record("error " + m + " " + s + " " + code);
+    }
+
+    @Override
+    public void suggestDarkScene() {
+      record("dark");
+    }
+
+    @Override
+    public void suggestBoringEvent() {
+      record("boring");
+    }
+
+    @Override
+    public void showMessage(String message) {
+      record("message [" + message + "]");
+    }
+
+    @Override
+    public void didProcessFrameDecision(CameraStabilityIssue issue, double value) {
+      record("decision " + issue + " " + value);
+    }
+
+    @Override
+    public void didProcessModuleDecision(ObjectModuleID m, JudgeVerdictOnModule verdict) {
+      record("module " + m + " " + verdict);
+    }
+  }
+
+  /** Overrides didDecode only. */
+  static class DecodeOnly extends EventDelegateBase {
+    final List<String> calls = new ArrayList<String>();
+
+    @Override
+    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+      calls.add("decode " + objects.size());
+    }
+  }
+
+  static class Thrower extends EventDelegateBase {
+    @Override
+    public void showMessage(String message) {
+      throw new IllegalStateException("bad message: " + message);
+    }
+
+    @Override
+    public void suggestDarkScene() {
+      throw new NoStringConstructor();
+    }
+  }
+
+  static class NoStringConstructor extends RuntimeException {
+    private static final long serialVersionUID = 1L;
+
+    NoStringConstructor() {
+      super("made without a message constructor");
+    }
+  }
+
+  static long handle(EventDelegateBase d) {
+    return EventDelegateBase.getCPtr(d);
+  }
+
+  @Test
+  void everyEventReachesTheJavaOverrideThroughTheNativeDelegate() {
+    Recorder r = new Recorder();
+    long h = handle(r);
+    OrzaVSMobileJNI.EventDelegateBase_didReceiveEvent(h, r, 1, 10, 0, 1);
+    OrzaVSMobileJNI.EventDelegateBase_didProcessFrame(h, r, 6, 0, 1L << 40, -7);
+    VectorOfObjectInfo objects = new VectorOfObjectInfo(2);
+    OrzaVSMobileJNI.EventDelegateBase_didDetect(h, r, VectorOfObjectInfo.getCPtr(objects), objects);
+    ResultMetadata metadata = new ResultMetadata();
+    metadata.setQueryID("q7");
+    VectorOfObjectInfo none = new VectorOfObjectInfo();
+    OrzaVSMobileJNI.EventDelegateBase_didDecode(h, r, VectorOfObjectInfo.getCPtr(none), none,
+        ResultMetadata.getCPtr(metadata), metadata);
+    VectorOfPoint2f points = new VectorOfPoint2f(3);
+    OrzaVSMobileJNI.EventDelegateBase_didDetectInterestPoints(h, r,
+        VectorOfPoint2f.getCPtr(points), points);
+    OrzaVSMobileJNI.EventDelegateBase_didReceiveServerError(h, r, 1, 2, 200);
+    OrzaVSMobileJNI.EventDelegateBase_suggestDarkScene(h, r);
+    OrzaVSMobileJNI.EventDelegateBase_suggestBoringEvent(h, r);
+    OrzaVSMobileJNI.EventDelegateBase_showMessage(h, r, "");
+    OrzaVSMobileJNI.EventDelegateBase_showMessage(h, r, "gr\u00fc\u00df \ud83d\ude00");
+    OrzaVSMobileJNI.EventDelegateBase_didProcessFrameDecision(h, r, 0, 0.75);
+    OrzaVSMobileJNI.EventDelegateBase_didProcessModuleDecision(h, r, 5, 0);
+    // Values without a Java constant arrive as null instead of failing the callback.
+    OrzaVSMobileJNI.EventDelegateBase_didReceiveEvent(h, r, 99, -3, 4, 5);
+    assertEquals(java.util.Arrays.asList(
+        "event VISUAL_SEARCH_SERVICE_MOD BOUNDING_BOX NO_ACTION FAILURE_STATUS",
+        "frame UNSPECIFIED_OBJECT_MOD SUCCESS_STATUS 1099511627776 -7",
+        "detect 2",
+        "decode q7 []",
+        "points 3",
+        "error VISUAL_SEARCH_SERVICE_MOD RESPONSE_PARSE_ERROR 200",
+        "dark",
+        "boring",
+        "message []",
+        "message [gr\u00fc\u00df \ud83d\ude00]",
+        "decision NO_STABILITY_ISSUE 0.75",
+        "module RESERVED_MOD NO_VERDICT",
+        "event null null null null"), r.calls);
+    assertSame(Thread.currentThread(), r.lastThread);
+
+    // The explicit forms reach the base implementation only: nothing is recorded.
+    OrzaVSMobileJNI.EventDelegateBase_showMessageSwigExplicitEventDelegateBase(h, r, "x");
+    OrzaVSMobileJNI.EventDelegateBase_suggestDarkSceneSwigExplicitEventDelegateBase(h, r);
+    assertEquals(13, r.calls.size());
+
+    assertThrowsWithMessage(NullPointerException.class,
+        "std::vector< Tovra::ObjectInfo > const & reference is null",
+        () -> OrzaVSMobileJNI.EventDelegateBase_didDecode(h, r, 0, null,
+            ResultMetadata.getCPtr(metadata), metadata));
+    assertThrowsWithMessage(NullPointerException.class,
+        "Tovra::ResultMetadata const & reference is null",
+        () -> OrzaVSMobileJNI.EventDelegateBase_didDecodeSwigExplicitEventDelegateBase(h, r,
+            VectorOfObjectInfo.getCPtr(none), none, 0, null));
+    assertThrowsWithMessage(NullPointerException.class,
+        "std::vector< OrzaVSMobile::Point2f > const & reference is null",
+        () -> OrzaVSMobileJNI.EventDelegateBase_didDetectInterestPoints(h, r, 0, null));
+    assertThrowsWithMessage(NullPointerException.class, "null string",
+        () -> OrzaVSMobileJNI.EventDelegateBase_showMessage(h, r, null));
+    assertEquals(13, r.calls.size());
+    r.delete();
+    objects.delete();
+    none.delete();
+    points.delete();
+    metadata.delete();
+  }
+
+  @Test
+  void onlyOverriddenOperationsGoToJava() {
+    DecodeOnly d = new DecodeOnly();
+    long h = handle(d);
+    VectorOfObjectInfo objects = new VectorOfObjectInfo(1);
+    ResultMetadata metadata = new ResultMetadata();
+    OrzaVSMobileJNI.EventDelegateBase_didDetect(h, d, VectorOfObjectInfo.getCPtr(objects), objects);
+    OrzaVSMobileJNI.EventDelegateBase_didDecode(h, d, VectorOfObjectInfo.getCPtr(objects), objects,
+        ResultMetadata.getCPtr(metadata), metadata);
+    assertEquals(java.util.Collections.singletonList("decode 1"), d.calls);
+
+    // The proxy class itself overrides nothing: every call is absorbed natively.
+    EventDelegateBase base = new EventDelegateBase();
+    base.didDecode(objects, metadata);
+    base.showMessage("absorbed");
+    base.didReceiveEvent(ObjectModuleID.BARCODE_MOD, ContentType.PIDN, ActionID.NO_ACTION,
+        StatusID.SUCCESS_STATUS);
+    d.delete();
+    base.delete();
+    objects.delete();
+    metadata.delete();
+  }
+
+  @Test
+  void javaExceptionsReturnToTheJavaCaller() {
+    Thrower t = new Thrower();
+    long h = handle(t);
+    assertThrowsWithMessage(IllegalStateException.class, "bad message: hi",
+        () -> OrzaVSMobileJNI.EventDelegateBase_showMessage(h, t, "hi"));
+    // A class that cannot be built from a message comes back as a RuntimeException naming it.
+    RuntimeException e = assertThrows(RuntimeException.class,
+        () -> OrzaVSMobileJNI.EventDelegateBase_suggestDarkScene(h, t));
+    assertEquals(
+        "com/orza/vs/mobile/library/impl/jni/DirectorTest$NoStringConstructor: made without a message constructor",
+        e.getMessage());
+    // On a thread without a Java caller the exception is reported and dropped: the native
+    // caller returns normally, and the thread is detached again.
+    assertEquals("detached-before;called;detached-after",
+        NativeTestHooks.showMessageOnNativeThread(h, "x"));
+    t.delete();
+  }
+
+  @Test
+  void nativeThreadsAreAttachedForOneUpcallOnly() throws Exception {
+    Recorder r = new Recorder();
+    long h = handle(r);
+    assertEquals("detached-before;called;detached-after",
+        NativeTestHooks.showMessageOnNativeThread(h, "one"));
+    Thread first = r.lastThread;
+    assertEquals("detached-before;called;detached-after",
+        NativeTestHooks.didDecodeOnNativeThread(h, 2, "q9"));
+    Thread second = r.lastThread;
+    assertNotSame(Thread.currentThread(), first);
+    assertNotSame(first, second);
+    first.join(5000);
+    assertFalse(first.isAlive(), "a thread attached for an upcall is detached after it");
+    assertEquals(java.util.Arrays.asList("message [one]",
+        "decode q9 result-0/BOUNDING_BOX/4 result-1/BOUNDING_BOX/4 [q-1, q-2]"), r.calls);
+    // A Java thread stays attached.
+    assertTrue(NativeTestHooks.showMessageOnThisThread(h, "two"));
+    assertSame(Thread.currentThread(), r.lastThread);
+    r.delete();
+  }
+
+  @Test
+  void collectedJavaObjectRaisesTheNullUpcallError() {
+    Recorder r = new Recorder();
+    long h = handle(r);
+    r.swigCMemOwn = false;  // the native delegate outlives its Java object
+    WeakReference<Recorder> ref = new WeakReference<Recorder>(r);
+    r = null;
+    for (int i = 0; i < 100 && ref.get() != null; i++) {
+      System.gc();
+      System.runFinalization();
+    }
+    assertNull(ref.get());
+    // The proxy has a finalizer: its native weak reference clears only once the finalized
+    // object is reclaimed by a later collection.
+    for (int i = 0; i < 3; i++) {
+      System.runFinalization();
+      System.gc();
+    }
+    VectorOfObjectInfo objects = new VectorOfObjectInfo();
+    ResultMetadata metadata = new ResultMetadata();
+    assertThrowsWithMessage(NullPointerException.class,
+        "null upcall object in Tovra::EventDelegateBase::didDecode ",
+        () -> OrzaVSMobileJNI.EventDelegateBase_didDecode(h, null,
+            VectorOfObjectInfo.getCPtr(objects), objects, ResultMetadata.getCPtr(metadata), metadata));
+    assertEquals("detached-before;called;detached-after",
+        NativeTestHooks.showMessageOnNativeThread(h, "nobody"));
+    OrzaVSMobileJNI.delete_EventDelegateBase(h);
+    objects.delete();
+    metadata.delete();
+  }
+
+  @Test
+  void ownershipChangesTheReferenceKind() {
+    Recorder r = new Recorder();
+    long h = handle(r);
+    r.swigReleaseOwnership();  // native code now owns the delegate and holds r strongly
+    WeakReference<Recorder> ref = new WeakReference<Recorder>(r);
+    r = null;
+    for (int i = 0; i < 5; i++) {
+      System.gc();
+    }
+    Recorder alive = ref.get();
+    assertNotNull(alive, "a strongly held Java object is not collected");
+    alive.swigTakeOwnership();
+    assertTrue(alive.swigCMemOwn);
+    // Destroying the native delegate disconnects the proxy: it forgets its handle.
+    OrzaVSMobileJNI.delete_EventDelegateBase(h);
+    assertEquals(0, EventDelegateBase.getCPtr(alive));
+    alive.delete();  // nothing left to free
+  }
+
+  static class Transport extends ServerDelegate {
+    final List<String> ids = Collections.synchronizedList(new ArrayList<String>());
+    volatile boolean fail;
+
+    @Override
+    public boolean sendServerRequestImpl(ServerRequest request) {
+      if (fail) throw new IllegalStateException("transport down");
+      ids.add(request.getId() + "@" + Thread.currentThread().getName());
+      return true;
+    }
+  }
+
+  static class Wrapping extends ServerDelegate {
+    final List<String> seen = new ArrayList<String>();
+
+    @Override
+    public boolean sendServerRequest(ServerRequest request) {
+      seen.add("send " + request.getId());
+      return super.sendServerRequest(request);
+    }
+
+    @Override
+    public boolean sendServerRequestImpl(ServerRequest request) {
+      seen.add("impl " + request.getId());
+      return false;
+    }
+  }
+
+  @Test
+  void serverDelegateReachesTheJavaTransport() {
+    Transport t = new Transport();
+    long h = ServerDelegate.getCPtr(t);
+    ServerRequest request = new ServerRequest();
+    request.setId("r-1");
+    // Not overridden: the base sendServerRequest registers and calls the Java Impl.
+    assertTrue(OrzaVSMobileJNI.ServerDelegate_sendServerRequest(h, t,
+        ServerRequest.getCPtr(request), request));
+    assertTrue(t.sendServerRequest(request));
+    assertEquals(2, t.ids.size());
+    assertTrue(t.ids.get(0).startsWith("r-1@"));
+    assertEquals(NativeTestHooks.sendRequestOnNativeThread(h, "r-2"),
+        "detached-before;result=true;detached-after");
+
+    // The transport's own exception: back to a Java caller; to a native caller as a
+    // director exception (the engine catches it).
+    t.fail = true;
+    assertThrowsWithMessage(IllegalStateException.class, "transport down",
+        () -> t.sendServerRequestImpl(request));
+    String report = NativeTestHooks.sendRequestOnNativeThread(h, "r-3");
+    assertTrue(report.startsWith("detached-before;threw="), report);
+    assertTrue(report.contains("DirectorException"), report);
+    assertTrue(report.endsWith(":transport down;detached-after"), report);
+
+    assertThrowsWithMessage(NullPointerException.class,
+        "Tovra::Server::ServerRequest const & reference is null",
+        () -> t.sendServerRequest(null));
+    assertThrowsWithMessage(NullPointerException.class,
+        "Tovra::Server::ServerResponse const & reference is null",
+        () -> t.pushServerResponse(null));
+    ServerResponse unknown = new ServerResponse();
+    unknown.setId("never-sent");
+    t.pushServerResponse(unknown);  // ignored
+    unknown.delete();
+
+    // Through the interface proxy too.
+    ServerDelegateInterface asInterface = new ServerDelegateInterface(
+        OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), false);
+    t.fail = false;
+    assertTrue(asInterface.sendServerRequest(request));
+    request.delete();
+    t.delete();
+    assertEquals(0, ServerDelegate.getCPtr(t));
+  }
+
+  @Test
+  void overridingSendServerRequestWrapsTheBase() {
+    Wrapping w = new Wrapping();
+    ServerRequest request = new ServerRequest();
+    request.setId("w");
+    assertFalse(OrzaVSMobileJNI.ServerDelegate_sendServerRequest(ServerDelegate.getCPtr(w), w,
+        ServerRequest.getCPtr(request), request));
+    assertEquals(java.util.Arrays.asList("send w", "impl w"), w.seen);
+    request.delete();
+    w.delete();
+  }
+
+  @Test
+  void transportWithoutImplementationFailsEveryRequest() {
+    ServerDelegate plain = new ServerDelegate();
+    ServerRequest request = new ServerRequest();
+    assertThrowsWithMessage(RuntimeException.class,
+        "Attempted to invoke pure virtual method Tovra::Server::ServerDelegate::sendServerRequestImpl.",
+        () -> plain.sendServerRequest(request));
+    ServerDelegate subclass = new ServerDelegate() {};
+    assertThrowsWithMessage(RuntimeException.class,
+        "Attempted to invoke pure virtual method Tovra::Server::ServerDelegate::sendServerRequestImpl.",
+        () -> subclass.sendServerRequest(request));
+    assertEquals("detached-before;result=false;detached-after",
+        NativeTestHooks.sendRequestOnNativeThread(ServerDelegate.getCPtr(subclass), "p"));
+    request.delete();
+    plain.delete();
+    subclass.delete();
+  }
+}

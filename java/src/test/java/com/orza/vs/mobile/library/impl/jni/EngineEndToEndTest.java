@@ -1,0 +1,301 @@
+package com.orza.vs.mobile.library.impl.jni;
+
+import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertThrowsWithMessage;
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertFalse;
+import static org.junit.jupiter.api.Assertions.assertNotNull;
+import static org.junit.jupiter.api.Assertions.assertSame;
+import static org.junit.jupiter.api.Assertions.assertThrows;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+
+import java.nio.ByteBuffer;
+import java.util.ArrayList;
+import java.util.Collections;
+import java.util.List;
+import java.util.concurrent.ExecutorService;
+import java.util.concurrent.Executors;
+import java.util.concurrent.LinkedBlockingQueue;
+import java.util.concurrent.TimeUnit;
+import org.junit.jupiter.api.AfterEach;
+import org.junit.jupiter.api.Test;
+
+/** The engine driven through Java as an app does: frames in, a Java transport, Java callbacks. */
+class EngineEndToEndTest {
+  static final int WIDTH = 320;
+  static final int HEIGHT = 240;
+  static final String REPLY = "{\"queryId\":\"q-1\",\"quillmark\":{\"searchResult\":["
+      + "{\"content\":\"shoe\",\"contentType\":\"PIDN\",\"properties\":{\"brand\":\"x\"}},"
+      + "{\"content\":\"\",\"contentType\":\"BoundingBox\",\"properties\":{\"boundingBox\":"
+      + "{\"tlx\":10,\"tly\":20,\"trx\":110,\"try\":20,\"brx\":110,\"bry\":90,\"blx\":10,\"bly\":90}}},"
+      + "{\"content\":\"dropped\",\"contentType\":\"Unknown\",\"properties\":{}}],"
+      + "\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[\"q-0\"]}}}";
+
+  /** What the app's delegate saw, copied out of the borrowed arguments. */
+  static class Events extends EventDelegateBase {
+    final LinkedBlockingQueue<String> decoded = new LinkedBlockingQueue<String>();
+    final List<Thread> pointThreads = Collections.synchronizedList(new ArrayList<Thread>());
+    volatile int lastPointCount = -1;
+    volatile String throwFromPoints;
+
+    @Override
+    public void didDetectInterestPoints(VectorOfPoint2f points) {
+      pointThreads.add(Thread.currentThread());
+      lastPointCount = points.size();
+      if (throwFromPoints != null) throw new IllegalStateException(throwFromPoints);
+    }
+
+    @Override
+    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+      StringBuilder text = new StringBuilder(Thread.currentThread().getName());
+      text.append('|').append(metadata.getQueryID()).append('|')
+          .append(metadata.getIsFinalAccumulation()).append('|')
+          .append(metadata.getMobileDecorator()).append('|').append(metadata.getAccumulatedQueries());
+      for (ObjectInfo o : objects) {
+        text.append('|').append(o.getSrcObjectModule()).append(' ').append(o.getContentType())
+            .append(' ').append(o.getContent());
+        for (Point2f p : o.getLocation()) {
+          text.append(" (").append((int) p.getX()).append(',').append((int) p.getY()).append(')');
+        }
+      }
+      decoded.add(text.toString());
+    }
+
+    @Override
+    public void didReceiveServerError(ObjectModuleID module, ResponseStatus status, int code) {
+      decoded.add(Thread.currentThread().getName() + "|error " + module + " " + status + " " + code);
+    }
+  }
+
+  /** A transport that answers from its own thread with a reply chosen by the test. */
+  static class Transport extends ServerDelegate {
+    final ExecutorService executor = Executors.newSingleThreadExecutor(r -> {
+      Thread t = new Thread(r, "transport");
+      t.setDaemon(true);
+      return t;
+    });
+    final LinkedBlockingQueue<String> sent = new LinkedBlockingQueue<String>();
+    volatile int code = 200;
+    volatile String body = REPLY;
+    volatile boolean throwOnSend;
+
+    @Override
+    public boolean sendServerRequestImpl(ServerRequest request) {
+      if (throwOnSend) throw new IllegalStateException("offline");
+      // The request is borrowed: copy what is needed before returning.
+      final String id = request.getId();
+      byte[] jpeg = request.getData().getData();
+      boolean hasParams = request.getParams().has_key("vsearch_params_json");
+      sent.add(id + "|" + (jpeg.length > 2 && (jpeg[0] & 0xff) == 0xff && (jpeg[1] & 0xff) == 0xd8)
+          + "|" + hasParams + "|" + Thread.currentThread().getName());
+      final int replyCode = code;
+      final String replyBody = body;
+      executor.execute(() -> {
+        ServerResponse response = new ServerResponse();
+        response.setId(id);
+        response.setResponseCode(replyCode);
+        response.setResponseStr(replyBody);
+        response.setRoundtripTime(0.01);
+        pushServerResponse(response);
+        response.delete();
+      });
+      return true;
+    }
+  }
+
+  Events events = new Events();
+  Transport transport = new Transport();
+  TovraStateEngineFacade engine = new TovraStateEngineFacade(events);
+  ImageBuffer image = new ImageBuffer();
+  ExtraFrameData extra = new ExtraFrameData();
+  ByteBuffer frame = ByteBuffer.allocateDirect(WIDTH * HEIGHT * 3 / 2);
+  double time = 100.0;
+
+  EngineEndToEndTest() {
+    engine.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, transport);
+    fillFrame(frame, 0);
+  }
+
+  @AfterEach
+  void tearDown() throws Exception {
+    engine.stopEngine();
+    engine.delete();
+    transport.executor.shutdown();
+    assertTrue(transport.executor.awaitTermination(5, TimeUnit.SECONDS));
+    transport.delete();
+    events.delete();
+    image.delete();
+    extra.delete();
+  }
+
+  /** A densely textured NV21 frame (a fixed pseudo-random pattern), shifted by {@code shift}. */
+  static void fillFrame(ByteBuffer frame, int shift) {
+    for (int y = 0; y < HEIGHT; y++) {
+      for (int x = 0; x < WIDTH; x++) {
+        frame.put(y * WIDTH + x, (byte) (((x + shift) * 7919 + y * 104729) % 251));
+      }
+    }
+    for (int i = WIDTH * HEIGHT; i < frame.capacity(); i++) frame.put(i, (byte) 128);
+  }
+
+  /** One frame through the lent-buffer path; returns the frame key. */
+  String streamFrame() {
+    image.setFormat(ImageFormat.NV21);
+    image.setWidth(WIDTH);
+    image.setHeight(HEIGHT);
+    image.setWidthStep(WIDTH);
+    image.setNumChannels(1);
+    String[] key = new String[1];
+    engine.requestImageBuffer(image, key);
+    assertNotNull(key[0]);
+    assertEquals(frame.capacity(), image.fillBufferWithByteBuffer(frame, frame.capacity()));
+    time += 0.2;
+    extra.setTimeStamp(time);
+    engine.process(key[0], image, extra);
+    return key[0];
+  }
+
+  String nextEvent() throws InterruptedException {
+    String event = events.decoded.poll(10, TimeUnit.SECONDS);
+    assertNotNull(event, "no callback within 10 s");
+    return event;
+  }
+
+  @Test
+  void framesGoOutAndResultsComeBackThroughJava() throws Exception {
+    engine.startEngine();
+    streamFrame();
+    String sent = transport.sent.poll(10, TimeUnit.SECONDS);
+    assertNotNull(sent, "no request reached the transport");
+    String[] parts = sent.split("\\|");
+    assertTrue(parts[0].startsWith("TovraStateEngine-"), sent);
+    assertEquals("true", parts[1], "the body is a JPEG");
+    assertEquals("true", parts[2], "the request carries vsearch_params_json");
+    assertFalse(parts[3].equals(Thread.currentThread().getName()), "sent from the engine's worker");
+
+    assertEquals("transport|q-1|true|TeskarMobileDecorator|[q-0]"
+        + "|VISUAL_SEARCH_SERVICE_MOD PIDN shoe"
+        + "|VISUAL_SEARCH_SERVICE_MOD BOUNDING_BOX  (10,20) (110,20) (110,90) (10,90)",
+        nextEvent());
+    assertSame(Thread.currentThread(), events.pointThreads.get(0),
+        "interest points arrive on the thread that called process");
+    assertTrue(events.lastPointCount > 0 && events.lastPointCount <= 50,
+        "points: " + events.lastPointCount);
+
+    // A failed exchange reaches the delegate as a server error.
+    transport.code = 500;
+    transport.body = "internal error";
+    for (int i = 0; i < 20 && transport.sent.isEmpty(); i++) {
+      streamFrame();
+      Thread.sleep(20);
+    }
+    assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS));
+    assertEquals("transport|error VISUAL_SEARCH_SERVICE_MOD RESPONSE_SERVER_ERROR 500", nextEvent());
+  }
+
+  @Test
+  void aThrowingTransportDoesNotStopTheEngine() throws Exception {
+    engine.startEngine();
+    transport.throwOnSend = true;
+    streamFrame();
+    Thread.sleep(300);  // the worker tries to send, fails, and gives the frame up
+    transport.throwOnSend = false;
+    for (int i = 0; i < 50 && transport.sent.isEmpty(); i++) {
+      streamFrame();
+      Thread.sleep(20);
+    }
+    assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS), "the engine sends again");
+    assertTrue(nextEvent().startsWith("transport|q-1|"));
+  }
+
+  @Test
+  void aThrowingCallbackReturnsToTheCallerAndTheEngineGoesOn() throws Exception {
+    engine.startEngine();
+    events.throwFromPoints = "no thanks";
+    // More frames than the engine has records: a lent buffer must not be lost per exception.
+    for (int i = 0; i < 8; i++) {
+      assertThrowsWithMessage(IllegalStateException.class, "no thanks", this::streamFrame);
+    }
+    events.throwFromPoints = null;
+    streamFrame();
+    assertEquals(9, events.pointThreads.size());
+  }
+
+  @Test
+  void singleImageReturnsAfterItsReplyWasHandled() throws Exception {
+    engine.startEngine();
+    ImageBuffer still = new ImageBuffer();
+    still.setFormat(ImageFormat.NV21);
+    still.setWidth(WIDTH);
+    still.setHeight(HEIGHT);
+    still.setWidthStep(WIDTH);
+    still.allocateBuffer(frame.capacity());
+    assertEquals(frame.capacity(), still.fillBufferWithByteBuffer(frame, frame.capacity()));
+    engine.processSingleImage(still, extra);
+    String event = events.decoded.poll();
+    assertNotNull(event, "the reply was handled before processSingleImage returned");
+    assertTrue(event.startsWith("transport|q-1|"), event);
+    still.delete();
+  }
+
+  @Test
+  void facadeOperationsAndArgumentChecks() {
+    CameraResRequirement requirement = new CameraResRequirement();
+    engine.getCameraResRequirement(requirement);
+    assertEquals(320, requirement.getMinHeight());
+    assertEquals(720, requirement.getMaxHeight());
+    MapOfStringToUInt counts = new MapOfStringToUInt();
+    counts.set("frames", 3);
+    MapOfStringToDouble values = new MapOfStringToDouble();
+    engine.getAndClearMetrics(counts, values);
+    assertEquals(3L, counts.get("frames"));
+    assertTrue(values.empty());
+    MapOfStringToString props = new MapOfStringToString();
+    engine.readProps("x");
+    engine.readObjectModuleProps(ObjectModuleID.BARCODE_MOD, "y");
+    engine.readObjectModuleProps(props);
+    engine.addObjectModule(ObjectModuleID.BARCODE_MOD, props);
+    engine.addObjectModule(ObjectModuleID.BARCODE_MOD, transport, "z");
+    engine.enableSingleImageMode();
+    engine.disableSingleImageMode();
+    engine.enableEventLogging();
+    engine.saveEventLog("/nonexistent/log");
+    engine.removeObjectModule(ObjectModuleID.BARCODE_MOD);
+    engine.removeAllObjectModules();
+    engine.pauseEngine();
+    engine.resumeEngine();
+
+    assertThrowsWithMessage(NullPointerException.class,
+        "Tovra::CameraResRequirement & reference is null", () -> engine.getCameraResRequirement(null));
+    assertThrowsWithMessage(NullPointerException.class,
+        "OrzaVSMobile::ImageBuffer & reference is null", () -> engine.process(null, extra));
+    assertThrowsWithMessage(NullPointerException.class,
+        "OrzaVSMobile::ExtraFrameData & reference is null", () -> engine.process("k", image, null));
+    assertThrowsWithMessage(NullPointerException.class, "null string",
+        () -> engine.process(null, image, extra));
+    assertThrowsWithMessage(NullPointerException.class,
+        "std::map< std::string,std::string > const & reference is null",
+        () -> engine.readObjectModuleProps(null));
+    assertThrowsWithMessage(NullPointerException.class,
+        "std::map< std::string,unsigned int > & reference is null",
+        () -> engine.getAndClearMetrics(null, values));
+    assertThrowsWithMessage(NullPointerException.class, "null string", () -> engine.readProps(null));
+    assertThrows(NullPointerException.class, () -> engine.requestImageBuffer(image, null));
+    assertThrows(IndexOutOfBoundsException.class,
+        () -> engine.requestImageBuffer(image, new String[0]));
+
+    // Stopped: no buffer is lent and the key stays as it was.
+    engine.stopEngine();
+    String[] key = {"unchanged"};
+    engine.requestImageBuffer(image, key);
+    assertEquals("unchanged", key[0]);
+
+    // A deleted engine is an exception, not a crash.
+    TovraStateEngineFacade other = new TovraStateEngineFacade(null);
+    other.delete();
+    assertThrows(NullPointerException.class, other::startEngine);
+    requirement.delete();
+    counts.delete();
+    values.delete();
+    props.delete();
+  }
+}

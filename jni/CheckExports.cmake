@@ -1,0 +1,67 @@
+# Checks that the shared library exports exactly the JNI functions listed in
+# exported-functions.txt (Java method names of OrzaVSMobileJNI, one a line), and that the Java
+# class declares exactly those native methods.
+#   cmake -DNM=nm -DLIBRARY=libOrzaVSMobile.so -DLIST=exported-functions.txt
+#         -DJAVA_SOURCE=OrzaVSMobileJNI.java -P CheckExports.cmake
+
+foreach(var NM LIBRARY LIST JAVA_SOURCE)
+  if(NOT DEFINED ${var})
+    message(FATAL_ERROR "CheckExports: ${var} is not set")
+  endif()
+endforeach()
+
+set(prefix "Java_com_orza_vs_mobile_library_impl_jni_OrzaVSMobileJNI_")
+set(expected_count 305)
+
+file(STRINGS "${LIST}" names)
+list(LENGTH names count)
+if(NOT count EQUAL expected_count)
+  message(FATAL_ERROR "CheckExports: ${LIST} lists ${count} functions, expected ${expected_count}")
+endif()
+set(expected_symbols "")
+foreach(name IN LISTS names)
+  string(REPLACE "_" "_1" mangled "${name}")
+  list(APPEND expected_symbols "${prefix}${mangled}")
+endforeach()
+
+execute_process(COMMAND "${NM}" -D --defined-only "${LIBRARY}"
+  OUTPUT_VARIABLE nm_output RESULT_VARIABLE nm_result)
+if(NOT nm_result EQUAL 0)
+  message(FATAL_ERROR "CheckExports: ${NM} failed on ${LIBRARY}")
+endif()
+string(REPLACE "\n" ";" nm_lines "${nm_output}")
+set(exported "")
+foreach(line IN LISTS nm_lines)
+  if(line MATCHES "([^ \t]+)[ \t]*$")
+    list(APPEND exported "${CMAKE_MATCH_1}")
+  endif()
+endforeach()
+
+set(missing ${expected_symbols})
+list(REMOVE_ITEM missing ${exported})
+set(extra ${exported})
+list(REMOVE_ITEM extra ${expected_symbols})
+list(LENGTH exported exported_count)
+message(STATUS "${LIBRARY}: ${exported_count} exported symbols")
+if(missing OR extra)
+  string(REPLACE ";" "\n  " missing_text "${missing}")
+  string(REPLACE ";" "\n  " extra_text "${extra}")
+  message(FATAL_ERROR "CheckExports: exports differ from ${LIST}\nmissing:\n  ${missing_text}\nunexpected:\n  ${extra_text}")
+endif()
+
+file(READ "${JAVA_SOURCE}" java_text)
+string(REGEX MATCHALL "native [^ (]+ [A-Za-z0-9_]+\\(" declarations "${java_text}")
+set(declared "")
+foreach(declaration IN LISTS declarations)
+  string(REGEX REPLACE "^native [^ ]+ ([A-Za-z0-9_]+)\\($" "\\1" name "${declaration}")
+  list(APPEND declared "${name}")
+endforeach()
+set(undeclared ${names})
+list(REMOVE_ITEM undeclared ${declared})
+set(unlisted ${declared})
+list(REMOVE_ITEM unlisted ${names})
+if(undeclared OR unlisted)
+  message(FATAL_ERROR "CheckExports: native methods of ${JAVA_SOURCE} differ from ${LIST}\nnot declared: ${undeclared}\nnot listed: ${unlisted}")
+endif()
+list(LENGTH declared declared_count)
+message(STATUS "${JAVA_SOURCE}: ${declared_count} native methods, all exported")

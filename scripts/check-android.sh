@@ -1,0 +1,50 @@
+#!/usr/bin/env bash
+# Checks the project's Android configuration without the NDK: configures and builds it with
+# cmake/toolchains/android-emulated.cmake (CMAKE_SYSTEM_NAME Android, ANDROID set, armeabi-v7a
+# flags, clang for 32-bit ARM, a sysroot that has jni.h and no libjpeg) passing libjpeg and
+# nlohmann-json the way README.md's "Android" section tells an app developer to, then checks
+# that no test or benchmark was configured and that the JNI library exports only JNI symbols.
+#   scripts/check-android.sh          build-android/
+set -euo pipefail
+cd "$(dirname "$0")/.."
+
+scripts/install-deps.sh
+scripts/armhf-sysroot.sh build-armhf/sysroot
+deps="$PWD/build-armhf/sysroot"
+
+dir=build-android
+ndk_sysroot="$PWD/$dir/ndk-sysroot"
+mkdir -p "$ndk_sysroot/usr/include"
+for h in jni.h jni_md.h; do
+  [ -e "$deps/usr/include/$h" ] && ln -sf "$(readlink -f "$deps/usr/include/$h")" "$ndk_sysroot/usr/include/$h"
+done
+
+jobs=$(nproc 2>/dev/null || echo 2)
+cmake -S . -B "$dir" -G Ninja -DCMAKE_TOOLCHAIN_FILE="$PWD/cmake/toolchains/android-emulated.cmake" \
+  -DORZAVS_ANDROID_SYSROOT="$ndk_sysroot" -DCMAKE_BUILD_TYPE=Release -DORZAVS_WERROR=ON \
+  -DJPEG_INCLUDE_DIR="$deps/usr/include" -DJPEG_LIBRARY="$deps/usr/lib/arm-linux-gnueabihf/libjpeg.so" \
+  -Dnlohmann_json_DIR="$deps/usr/share/cmake/nlohmann_json" >"$dir/configure.log" \
+  || { cat "$dir/configure.log"; exit 1; }
+cmake --build "$dir" -j "$jobs"
+
+fail=0
+if [ -d "$dir/tests" ] || [ -d "$dir/bench" ]; then
+  echo "check-android: tests or benchmarks were configured for an Android build"
+  fail=1
+fi
+so="$dir/jni/libOrzaVSMobile.so"
+if [ -f "$so" ]; then
+  exported=$(arm-linux-gnueabihf-nm -D --defined-only "$so" | awk '{print $3}')
+  total=$(printf '%s\n' "$exported" | grep -c . || true)
+  other=$(printf '%s\n' "$exported" | grep -v -E '^(Java_|JNI_OnLoad$|JNI_OnUnload$)' | grep . || true)
+  echo "check-android: $so exports $total symbols"
+  if [ -n "$other" ]; then
+    echo "check-android: exports other than JNI entry points:"
+    printf '%s\n' "$other" | head -20
+    fail=1
+  fi
+else
+  echo "check-android: no JNI library was built (jni/ not present yet)"
+fi
+[ "$fail" = 0 ] && echo "check-android: Android configuration OK"
+exit "$fail"

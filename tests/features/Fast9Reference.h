@@ -1,0 +1,174 @@
+#ifndef ORZAVS_TESTS_FEATURES_FAST9REFERENCE_H
+#define ORZAVS_TESTS_FEATURES_FAST9REFERENCE_H
+
+// A deliberately plain FAST-9 written straight from the detector's definition, to check the
+// optimised detector against: per-pixel segment test with the circle listed position by
+// position, the corner score by binary search on the threshold, suppression by looking at the
+// 8 neighbours on a dense grid. Slow, obviously correct, small planes only.
+
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdint>
+#include <cstring>
+#include <map>
+#include <random>
+#include <utility>
+#include <vector>
+
+#include "features/Fast9.h"
+
+namespace fast9ref {
+
+using OrzaVSMobile::Fast9Corner;
+
+// Circle positions 0..15 as (dx, dy): straight below the centre first, then towards +x.
+constexpr int kCircle[16][2] = {{0, 3},  {1, 3},   {2, 2},   {3, 1},   {3, 0},  {3, -1},  {2, -2},  {1, -3},
+                                {0, -3}, {-1, -3}, {-2, -2}, {-3, -1}, {-3, 0}, {-3, 1}, {-2, 2}, {-1, 3}};
+
+inline int at(const uint8_t* plane, int stride, int x, int y) {
+  return plane[static_cast<ptrdiff_t>(y) * stride + x];
+}
+
+inline bool isCorner(const uint8_t* plane, int stride, int x, int y, int b) {
+  const int c = at(plane, stride, x, y);
+  for (int polarity = 0; polarity < 2; ++polarity) {
+    for (int start = 0; start < 16; ++start) {
+      bool all = true;
+      for (int i = 0; i < 9 && all; ++i) {
+        const int k = (start + i) % 16;
+        const int p = at(plane, stride, x + kCircle[k][0], y + kCircle[k][1]);
+        all = polarity == 0 ? (p > c + b) : (p < c - b);
+      }
+      if (all) return true;
+    }
+  }
+  return false;
+}
+
+// Binary search as defined; b must not exceed 255 (above that the search never ends).
+inline int score(const uint8_t* plane, int stride, int x, int y, int b) {
+  int low = b, high = 255;
+  do {
+    const int t = (low + high) / 2;
+    if (isCorner(plane, stride, x, y, t)) {
+      low = t;
+    } else {
+      high = t;
+    }
+  } while (!(low == high - 1 || low == high));
+  return low;
+}
+
+struct Detection {
+  std::vector<Fast9Corner> corners;
+  std::vector<int> scores;
+};
+
+inline Detection detect(const uint8_t* plane, int width, int height, int stride, int b) {
+  Detection d;
+  for (int y = 3; y < height - 3; ++y) {
+    for (int x = 3; x < width - 3; ++x) {
+      if (isCorner(plane, stride, x, y, b)) {
+        d.corners.push_back(Fast9Corner{x, y});
+        d.scores.push_back(score(plane, stride, x, y, b));
+      }
+    }
+  }
+  return d;
+}
+
+// Dropped when a corner among the 8 neighbours has a score >= its own.
+inline Detection suppress(const Detection& raw) {
+  std::map<std::pair<int, int>, int> grid;
+  for (size_t i = 0; i < raw.corners.size(); ++i) grid[{raw.corners[i].x, raw.corners[i].y}] = raw.scores[i];
+  Detection kept;
+  for (size_t i = 0; i < raw.corners.size(); ++i) {
+    const Fast9Corner c = raw.corners[i];
+    bool dominated = false;
+    for (int dy = -1; dy <= 1; ++dy) {
+      for (int dx = -1; dx <= 1; ++dx) {
+        if (dx == 0 && dy == 0) continue;
+        auto it = grid.find({c.x + dx, c.y + dy});
+        if (it != grid.end() && it->second >= raw.scores[i]) dominated = true;
+      }
+    }
+    if (!dominated) {
+      kept.corners.push_back(c);
+      kept.scores.push_back(raw.scores[i]);
+    }
+  }
+  return kept;
+}
+
+// A plane in its own pages, placed so that its last byte ends a readable page and an
+// unreadable page follows, with another unreadable page before the first byte: a read outside
+// the (height-1)*stride + width bytes of the plane faults at once, sanitizer or not.
+class GuardedPlane {
+ public:
+  GuardedPlane(const std::vector<uint8_t>& bytes) : size_(bytes.size()) {
+    const size_t page = static_cast<size_t>(sysconf(_SC_PAGESIZE));
+    const size_t dataPages = (size_ + page - 1) / page + 1;
+    length_ = (dataPages + 2) * page;
+    void* m = mmap(nullptr, length_, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    if (m == MAP_FAILED) return;
+    base_ = static_cast<uint8_t*>(m);
+    mprotect(base_, page, PROT_NONE);
+    mprotect(base_ + (dataPages + 1) * page, page, PROT_NONE);
+    data_ = base_ + (dataPages + 1) * page - size_;
+    if (size_ > 0) std::memcpy(data_, bytes.data(), size_);
+  }
+  ~GuardedPlane() {
+    if (base_ != nullptr) munmap(base_, length_);
+  }
+  GuardedPlane(const GuardedPlane&) = delete;
+  GuardedPlane& operator=(const GuardedPlane&) = delete;
+  const uint8_t* data() const { return data_; }
+  bool ok() const { return base_ != nullptr; }
+
+ private:
+  size_t size_;
+  size_t length_ = 0;
+  uint8_t* base_ = nullptr;
+  uint8_t* data_ = nullptr;
+};
+
+// Exactly the bytes a plane of this geometry spans: (height-1)*stride + width.
+inline size_t planeBytes(int width, int height, int stride) {
+  return static_cast<size_t>(height - 1) * static_cast<size_t>(stride) + static_cast<size_t>(width);
+}
+
+// Planes of several kinds, every byte (row padding included) drawn from `rng`.
+enum class Content { Noise, LowContrast, Blocks, Extremes };
+
+inline std::vector<uint8_t> makePlane(int width, int height, int stride, Content content, std::mt19937& rng) {
+  std::vector<uint8_t> p(planeBytes(width, height, stride));
+  std::uniform_int_distribution<int> any(0, 255);
+  for (auto& v : p) v = static_cast<uint8_t>(any(rng));  // padding keeps this garbage
+  for (int y = 0; y < height; ++y) {
+    for (int x = 0; x < width; ++x) {
+      int v = 0;
+      switch (content) {
+        case Content::Noise:
+          v = any(rng);
+          break;
+        case Content::LowContrast:
+          v = 100 + any(rng) % 61;
+          break;
+        case Content::Blocks:  // flat rectangles of a few levels, with single-pixel specks
+          v = ((x / 5 + y / 4) % 3) * 90 + ((x * 7 + y * 13) % 17 == 0 ? 60 : 0);
+          break;
+        case Content::Extremes:  // values at both ends, where c + b and c - b leave 0..255
+          v = (any(rng) % 2) ? any(rng) % 12 : 244 + any(rng) % 12;
+          break;
+      }
+      p[static_cast<size_t>(y) * stride + x] = static_cast<uint8_t>(v);
+    }
+  }
+  return p;
+}
+
+}  // namespace fast9ref
+
+#endif

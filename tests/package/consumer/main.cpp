@@ -1,0 +1,46 @@
+// A native client: includes only the umbrella header and links only OrzaVSMobile::orzavs.
+#include <OrzaVSMobile.h>
+
+#include <cstdio>
+#include <vector>
+
+namespace {
+
+class Events : public Tovra::EventDelegateBase {
+ public:
+  void didDetectInterestPoints(const std::vector<OrzaVSMobile::Point2f>& points) override {
+    lastCount = points.size();
+  }
+  size_t lastCount = 0;
+};
+
+class Transport : public Tovra::Server::ServerDelegate {
+ public:
+  bool sendServerRequestImpl(const Tovra::Server::ServerRequest& request) override {
+    (void)request;
+    return false;  // this client never reaches a server
+  }
+};
+
+}  // namespace
+
+int main() {
+  Events events;
+  Transport transport;
+  Tovra::CameraResRequirement requirement;
+  {
+    Tovra::TovraStateEngineFacade facade(&events);
+    facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
+    facade.getCameraResRequirement(requirement);
+  }
+
+  OrzaVSMobile::ImageBuffer buffer;
+  const std::vector<uint8_t> pixels(64, 128);
+  buffer.allocateBuffer(64);
+  const int32_t filled = buffer.fillBuffer(pixels.data(), 64);
+
+  std::printf("camera %d-%d, filled %d, module %s\n", requirement.minHeight,
+              requirement.maxHeight, filled,
+              Tovra::ObjectModuleIDNames.at(Tovra::VISUAL_SEARCH_SERVICE_MOD).c_str());
+  return filled == 64 ? 0 : 1;
+}

@@ -1,0 +1,164 @@
+package com.orza.vs.mobile.library.http;
+
+import static org.junit.jupiter.api.Assertions.assertArrayEquals;
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertThrows;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+
+import com.orza.vs.tools.server.Multipart;
+import com.orza.vs.tools.server.ReferenceServer;
+import com.sun.net.httpserver.HttpServer;
+import java.io.IOException;
+import java.io.OutputStream;
+import java.net.InetAddress;
+import java.net.InetSocketAddress;
+import java.net.ServerSocket;
+import java.net.URL;
+import java.nio.charset.StandardCharsets;
+import java.util.LinkedHashMap;
+import java.util.Map;
+import java.util.concurrent.CompletableFuture;
+import java.util.concurrent.TimeUnit;
+import java.util.concurrent.atomic.AtomicReference;
+import org.junit.jupiter.api.AfterEach;
+import org.junit.jupiter.api.BeforeEach;
+import org.junit.jupiter.api.Test;
+
+/** The transport's HTTP exchange over loopback, without the engine. */
+class VisualSearchHttpClientTest {
+  ReferenceServer server;
+
+  @BeforeEach
+  void start() throws IOException {
+    ReferenceServer.Options o = new ReferenceServer.Options();
+    o.log = null;
+    server = new ReferenceServer(o).start();
+  }
+
+  @AfterEach
+  void stop() {
+    server.close();
+  }
+
+  static Map<String, String> map(String... kv) {
+    Map<String, String> m = new LinkedHashMap<>();
+    for (int i = 0; i + 1 < kv.length; i += 2) m.put(kv[i], kv[i + 1]);
+    return m;
+  }
+
+  VisualSearchHttpClient client(String path, int readTimeoutMs) throws IOException {
+    return new VisualSearchHttpClient(new URL(server.baseUrl() + path), 1000, readTimeoutMs);
+  }
+
+  @Test
+  void wireFormatIsTheMultipartFormTheServerReads() throws IOException {
+    AtomicReference<byte[]> body = new AtomicReference<>();
+    AtomicReference<String> type = new AtomicReference<>();
+    AtomicReference<String> id = new AtomicReference<>();
+    HttpServer capture = HttpServer.create(new InetSocketAddress(InetAddress.getLoopbackAddress(), 0), 4);
+    capture.createContext("/", ex -> {
+      type.set(ex.getRequestHeaders().getFirst("Content-Type"));
+      id.set(ex.getRequestHeaders().getFirst("X-Request-Id"));
+      body.set(ex.getRequestBody().readAllBytes());
+      byte[] reply = "{\"ok\":\"\u00e9\"}".getBytes(StandardCharsets.UTF_8);
+      ex.getResponseHeaders().set("Content-Type", "application/json; charset=utf-8");
+      ex.sendResponseHeaders(201, reply.length);
+      try (OutputStream os = ex.getResponseBody()) {
+        os.write(reply);
+      }
+    });
+    capture.start();
+    try {
+      byte[] jpeg = new byte[5000];
+      for (int i = 0; i < jpeg.length; i++) jpeg[i] = (byte) (i * 7); // includes CR, LF and '-'
+      String params = "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}";
+      VisualSearchHttpClient c = new VisualSearchHttpClient(
+          new URL("http://127.0.0.1:" + capture.getAddress().getPort() + "/vs"), 1000, 2000);
+      VisualSearchHttpClient.Exchange e = c.post("TovraStateEngine-1-2\r\nX: y",
+          map("vsearch_params_json", params), map("version", "0.6", "orientation", "90", "na\"me", "\u00fcmlaut"), jpeg);
+      assertEquals(201, e.code);
+      assertEquals("{\"ok\":\"\u00e9\"}", e.body);
+      assertTrue(e.seconds > 0 && e.seconds < 2, "round trip in seconds: " + e.seconds);
+      assertEquals("TovraStateEngine-1-2  X: y", id.get());
+      Multipart m = Multipart.parse(body.get(), Multipart.boundaryOf(type.get()));
+      assertEquals(params, m.fields.get("vsearch_params_json"));
+      assertEquals("0.6", m.fields.get("version"));
+      assertEquals("90", m.fields.get("orientation"));
+      assertEquals("\u00fcmlaut", m.fields.get("na%22me"));
+      assertArrayEquals(jpeg, m.files.get("file"));
+    } finally {
+      capture.stop(0);
+    }
+  }
+
+  @Test
+  void serverStatusesAndBodiesPassThrough() throws IOException {
+    VisualSearchHttpClient.Exchange e500 = client("/test/500", 2000).post("a", map("vsearch_params_json", "{}"), map(), new byte[1]);
+    assertEquals(500, e500.code);
+    assertTrue(e500.body.contains("error"), e500.body);
+    VisualSearchHttpClient.Exchange html = client("/test/notjson", 2000).post("b", map(), map(), new byte[1]);
+    assertEquals(200, html.code);
+    assertTrue(html.body.startsWith("<html>"));
+    // The real service rejects a request without a JPEG: the client reports the 4xx as it came.
+    VisualSearchHttpClient.Exchange bad = client("/vsearch", 2000).post("c", map(), map(), new byte[0]);
+    assertEquals(400, bad.code);
+  }
+
+  @Test
+  void failuresBecomeNegativeCodesWithoutHanging() throws IOException {
+    int closedPort;
+    try (ServerSocket s = new ServerSocket(0, 1, InetAddress.getLoopbackAddress())) {
+      closedPort = s.getLocalPort();
+    }
+    VisualSearchHttpClient.Exchange refused = new VisualSearchHttpClient(new URL("http://127.0.0.1:" + closedPort + "/vsearch"), 1000, 1000)
+        .post("a", map(), map(), new byte[1]);
+    assertEquals(VisualSearchHttpClient.CODE_CONNECTION_FAILED, refused.code);
+    assertTrue(refused.body.startsWith("transport: "), refused.body);
+
+    long t0 = System.nanoTime();
+    VisualSearchHttpClient.Exchange slow = client("/test/slow/3000", 300).post("b", map(), map(), new byte[1]);
+    double s = (System.nanoTime() - t0) / 1e9;
+    assertEquals(VisualSearchHttpClient.CODE_TIMEOUT, slow.code, slow.body);
+    assertTrue(s < 2.0, "timed out after " + s + " s");
+    assertTrue(slow.seconds >= 0.29, "measured " + slow.seconds);
+
+    assertThrows(IllegalArgumentException.class, () -> new VisualSearchHttpClient(new URL("file:///tmp/x"), 1, 1));
+  }
+
+  @Test
+  void oversizedRepliesAreRefused() throws IOException {
+    HttpServer big = HttpServer.create(new InetSocketAddress(InetAddress.getLoopbackAddress(), 0), 4);
+    big.createContext("/", ex -> {
+      ex.getRequestBody().readAllBytes();
+      ex.sendResponseHeaders(200, 0);
+      try (OutputStream os = ex.getResponseBody()) {
+        os.write(new byte[300_000]);
+      } catch (IOException ignored) {
+        // the client hangs up once it has seen enough
+      }
+    });
+    big.start();
+    try {
+      VisualSearchHttpClient c = new VisualSearchHttpClient(new URL("http://127.0.0.1:" + big.getAddress().getPort() + "/"), 1000, 2000);
+      c.setMaxReplyBytes(100_000);
+      VisualSearchHttpClient.Exchange e = c.post("a", map(), map(), new byte[1]);
+      assertEquals(VisualSearchHttpClient.CODE_CONNECTION_FAILED, e.code);
+      assertTrue(e.body.contains("longer than 100000"), e.body);
+    } finally {
+      big.stop(0);
+    }
+  }
+
+  @Test
+  void closeBreaksARequestInFlightAndRefusesNewOnes() throws Exception {
+    VisualSearchHttpClient c = client("/test/slow/5000", 10_000);
+    CompletableFuture<VisualSearchHttpClient.Exchange> f = CompletableFuture.supplyAsync(() -> c.post("a", map(), map(), new byte[1]));
+    Thread.sleep(300); // let it connect and wait for the answer
+    long t0 = System.nanoTime();
+    c.close();
+    VisualSearchHttpClient.Exchange e = f.get(3, TimeUnit.SECONDS);
+    assertEquals(VisualSearchHttpClient.CODE_CLOSED, e.code, e.body);
+    assertTrue((System.nanoTime() - t0) / 1e9 < 2.0);
+    assertEquals(VisualSearchHttpClient.CODE_CLOSED, c.post("b", map(), map(), new byte[1]).code);
+  }
+}

@@ -1,0 +1,215 @@
+package com.orza.vs.tools.scan;
+
+import static org.junit.jupiter.api.Assertions.assertArrayEquals;
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertFalse;
+import static org.junit.jupiter.api.Assertions.assertNull;
+import static org.junit.jupiter.api.Assertions.assertThrows;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+
+import java.awt.Color;
+import java.awt.Graphics2D;
+import java.awt.Rectangle;
+import java.awt.image.BufferedImage;
+import java.io.ByteArrayOutputStream;
+import java.io.EOFException;
+import java.io.File;
+import java.io.IOException;
+import java.nio.charset.StandardCharsets;
+import java.nio.file.Files;
+import java.nio.file.Path;
+import java.util.Arrays;
+import javax.imageio.ImageIO;
+import org.junit.jupiter.api.Test;
+import org.junit.jupiter.api.io.TempDir;
+
+/** Colour conversion and the frame sources. */
+class FrameSourcesTest {
+  @TempDir
+  Path tmp;
+
+  @Test
+  void nv21LayoutAndColourRoundTrip() {
+    // Blocks of 2x2 pixels of one colour each, so that 4:2:0 subsampling loses nothing.
+    int[] colours = {0xff0000, 0x00ff00, 0x0000ff, 0xffffff, 0x000000, 0x808080, 0xc08040, 0x20a0e0};
+    BufferedImage img = new BufferedImage(8, 4, BufferedImage.TYPE_INT_RGB);
+    for (int y = 0; y < 4; y++) {
+      for (int x = 0; x < 8; x++) img.setRGB(x, y, colours[(y / 2) * 4 + x / 2]);
+    }
+    Frame f = Yuv.toNv21(img, 3);
+    assertEquals(3, f.index);
+    assertEquals(Frame.NV21, f.format);
+    assertEquals(8 * 4 * 3 / 2, f.data.length);
+    // Pure red: Y 76, then V (Cr) 255 before U (Cb) 85.
+    assertEquals(76, f.data[0] & 0xff);
+    assertEquals(255, f.data[32] & 0xff);
+    assertEquals(85, f.data[33] & 0xff);
+    BufferedImage back = Yuv.toImage(f);
+    for (int y = 0; y < 4; y++) {
+      for (int x = 0; x < 8; x++) {
+        int a = img.getRGB(x, y), b = back.getRGB(x, y);
+        for (int shift = 0; shift <= 16; shift += 8) {
+          int d = Math.abs(((a >> shift) & 0xff) - ((b >> shift) & 0xff));
+          assertTrue(d <= 3, "pixel " + x + "," + y + " channel " + shift + " off by " + d);
+        }
+      }
+    }
+  }
+
+  @Test
+  void oddImagesLoseTheirLastColumnAndRowAndPlanesAreReordered() {
+    Frame f = Yuv.toNv21(new BufferedImage(7, 5, BufferedImage.TYPE_INT_RGB), 0);
+    assertEquals(6, f.width);
+    assertEquals(4, f.height);
+    assertThrows(IllegalArgumentException.class, () -> Yuv.toNv21(new BufferedImage(1, 9, BufferedImage.TYPE_INT_RGB), 0));
+    // I420 (Y, U, V) of a 2x2 frame to NV21 (Y, V, U).
+    assertArrayEquals(new byte[] {1, 2, 3, 4, 6, 5}, Yuv.i420ToNv21(new byte[] {1, 2, 3, 4, 5, 6}, 2, 2));
+    assertArrayEquals(new byte[] {0, 0, 0, 0, 0, 0, 0, 0, 9, 8, 19, 18},
+        Yuv.i420ToNv21(new byte[] {0, 0, 0, 0, 0, 0, 0, 0, 8, 18, 9, 19}, 4, 2));
+    assertThrows(IllegalArgumentException.class, () -> new Frame(0, 4, 2, Frame.NV21, new byte[11]));
+    assertThrows(IllegalArgumentException.class, () -> new Frame(0, 3, 2, Frame.NV21, new byte[9]));
+  }
+
+  private File y4m(String header, byte[]... frames) throws IOException {
+    ByteArrayOutputStream b = new ByteArrayOutputStream();
+    b.writeBytes((header + "\n").getBytes(StandardCharsets.US_ASCII));
+    for (byte[] f : frames) {
+      b.writeBytes("FRAME\n".getBytes(StandardCharsets.US_ASCII));
+      b.writeBytes(f);
+    }
+    File file = tmp.resolve("v" + System.nanoTime() + ".y4m").toFile();
+    Files.write(file.toPath(), b.toByteArray());
+    return file;
+  }
+
+  private static byte[] ramp(int n, int start) {
+    byte[] b = new byte[n];
+    for (int i = 0; i < n; i++) b[i] = (byte) (start + i);
+    return b;
+  }
+
+  @Test
+  void y4mFramesArriveAsI420WithTheirRate() throws IOException {
+    byte[] a = ramp(12, 0), b = ramp(12, 100);
+    try (FrameSource s = FileSources.open(y4m("YUV4MPEG2 W4 H2 F15:2 Ip A1:1 C420jpeg XYSCSS=420JPEG", a, b), null, -1, 1)) {
+      assertEquals(7.5, s.fps(), 1e-9);
+      Frame f0 = s.next();
+      Frame f1 = s.next();
+      assertNull(s.next());
+      assertEquals(Frame.I420, f0.format);
+      assertEquals(4, f0.width);
+      assertEquals(2, f0.height);
+      assertArrayEquals(a, f0.data);
+      assertArrayEquals(b, f1.data);
+      assertEquals(1, f1.index);
+    }
+    // Mono video gets neutral chroma; --fps overrides the header's rate.
+    try (FrameSource s = FileSources.open(y4m("YUV4MPEG2 W4 H2 Cmono", ramp(8, 1)), null, 24, 1)) {
+      Frame f = s.next();
+      assertEquals(24, s.fps(), 1e-9);
+      assertArrayEquals(Arrays.copyOf(ramp(8, 1), 8), Arrays.copyOf(f.data, 8));
+      for (int i = 8; i < 12; i++) assertEquals(128, f.data[i] & 0xff);
+    }
+  }
+
+  @Test
+  void badY4mInputIsReportedNotCrashed() throws IOException {
+    try (FrameSource s = FileSources.open(y4m("YUV4MPEG2 W4 H2", ramp(12, 0), ramp(5, 0)), null, -1, 1)) {
+      s.next();
+      assertThrows(EOFException.class, s::next);
+    }
+    String[] badHeaders = {"NOTY4M W4 H2", "YUV4MPEG2 H2", "YUV4MPEG2 W4 H2 C444", "YUV4MPEG2 W4 H2 It", "YUV4MPEG2 W3 H2",
+        "YUV4MPEG2 Wx H2", "YUV4MPEG2 W100000 H100000"};
+    for (String h : badHeaders) {
+      File f = y4m(h);
+      assertThrows(IOException.class, () -> FileSources.open(f, null, -1, 1), h);
+    }
+    File garbage = tmp.resolve("g.y4m").toFile();
+    Files.write(garbage.toPath(), new byte[10_000]); // no newline: header longer than allowed
+    assertThrows(IOException.class, () -> FileSources.open(garbage, null, -1, 1));
+  }
+
+  @Test
+  void rawStreamNeedsASizeAndIgnoresTrailingBytes() throws IOException {
+    File raw = tmp.resolve("cam.nv21").toFile();
+    byte[] data = ramp(3 * 12 + 5, 0);
+    Files.write(raw.toPath(), data);
+    IOException e = assertThrows(IOException.class, () -> FileSources.open(raw, null, -1, 1));
+    assertTrue(e.getMessage().contains("--size"));
+    try (FrameSource s = FileSources.open(raw, new int[] {4, 2}, -1, 1)) {
+      assertEquals(3, s.expectedFrames());
+      assertEquals(30, s.fps(), 1e-9);
+      for (int i = 0; i < 3; i++) {
+        Frame f = s.next();
+        assertEquals(Frame.NV21, f.format);
+        assertArrayEquals(Arrays.copyOfRange(data, 12 * i, 12 * i + 12), f.data);
+      }
+      assertNull(s.next());
+    }
+    assertThrows(IOException.class, () -> FileSources.open(raw, new int[] {3, 2}, -1, 1));
+    assertThrows(IOException.class, () -> FileSources.open(tmp.resolve("missing").toFile(), new int[] {4, 2}, -1, 1));
+  }
+
+  private void png(String name, Color c) throws IOException {
+    BufferedImage img = new BufferedImage(6, 4, BufferedImage.TYPE_INT_RGB);
+    Graphics2D g = img.createGraphics();
+    g.setColor(c);
+    g.fillRect(0, 0, 6, 4);
+    g.dispose();
+    ImageIO.write(img, "png", tmp.resolve(name).toFile());
+  }
+
+  @Test
+  void imageFoldersGoInNameOrderAndRepeat() throws IOException {
+    png("b.png", Color.WHITE);
+    png("a.PNG", Color.BLACK);
+    Files.write(tmp.resolve("notes.txt"), new byte[] {1});
+    try (FrameSource s = FileSources.open(tmp.toFile(), null, -1, 2)) {
+      assertEquals(4, s.expectedFrames());
+      assertEquals(5, s.fps(), 1e-9);
+      int[] firstLuma = new int[4];
+      for (int i = 0; i < 4; i++) {
+        Frame f = s.next();
+        assertEquals(i, f.index);
+        firstLuma[i] = f.data[0] & 0xff;
+      }
+      assertNull(s.next());
+      assertArrayEquals(new int[] {0, 0, 255, 255}, firstLuma);
+    }
+    Files.write(tmp.resolve("c.png"), "not a png".getBytes(StandardCharsets.UTF_8));
+    try (FrameSource s = FileSources.open(tmp.toFile(), null, -1, 1)) {
+      s.next();
+      s.next();
+      assertThrows(IOException.class, s::next);
+    }
+    File empty = tmp.resolve("empty").toFile();
+    assertTrue(empty.mkdir());
+    assertThrows(IOException.class, () -> FileSources.open(empty, null, -1, 1));
+  }
+
+  @Test
+  void generatedSceneMovesTheCardInsideTheFrame() {
+    GeneratedSource s = new GeneratedSource(320, 240, 20, 30);
+    assertEquals(20, s.expectedFrames());
+    Frame first = s.next();
+    Rectangle bounds = new Rectangle(0, 0, 320, 240);
+    Rectangle r0 = s.objectRect(0);
+    assertTrue(bounds.contains(r0), r0.toString());
+    // The card is far brighter-and-darker textured than the background: its luma spans widely.
+    int min = 255, max = 0;
+    for (int y = r0.y; y < r0.y + r0.height; y++) {
+      for (int x = r0.x; x < r0.x + r0.width; x++) {
+        int v = first.data[y * 320 + x] & 0xff;
+        min = Math.min(min, v);
+        max = Math.max(max, v);
+      }
+    }
+    assertTrue(max - min > 150, "card contrast " + (max - min));
+    Frame second = s.next();
+    assertFalse(Arrays.equals(first.data, second.data));
+    for (int i = 0; i < 20; i++) assertTrue(bounds.contains(s.objectRect(i)), "frame " + i);
+    for (int i = 2; i < 20; i++) s.next();
+    assertNull(s.next());
+    assertThrows(IllegalArgumentException.class, () -> new GeneratedSource(63, 64, 1, 30));
+  }
+}

@@ -1,0 +1,136 @@
+package com.orza.vs.tools.scan;
+
+import static org.junit.jupiter.api.Assertions.assertEquals;
+import static org.junit.jupiter.api.Assertions.assertFalse;
+import static org.junit.jupiter.api.Assertions.assertSame;
+import static org.junit.jupiter.api.Assertions.assertTrue;
+
+import java.awt.image.BufferedImage;
+import java.io.ByteArrayOutputStream;
+import java.io.File;
+import java.io.IOException;
+import java.nio.charset.StandardCharsets;
+import java.nio.file.Files;
+import java.nio.file.Path;
+import java.util.Arrays;
+import java.util.Collections;
+import java.util.List;
+import javax.imageio.ImageIO;
+import org.junit.jupiter.api.Test;
+import org.junit.jupiter.api.io.TempDir;
+
+/** Bookkeeping of a scan, its summary figures and its report, without the engine. */
+class ScanLogTest {
+  @TempDir
+  Path tmp;
+
+  @Test
+  void frameIdsComeFromTheEndOfKeysAndRequestIds() {
+    assertEquals(17, ScanLog.frameIdOf("TovraStateEngine-1700000000-17"));
+    assertEquals(17, ScanLog.frameIdOf("1700000000-17"));
+    assertEquals(-1, ScanLog.frameIdOf("no-number-here-x"));
+    assertEquals(-1, ScanLog.frameIdOf("plain"));
+    assertEquals(-1, ScanLog.frameIdOf(null));
+  }
+
+  @Test
+  void reportsGoToTheRequestAnsweredOnTheSameThread() throws Exception {
+    ScanLog log = new ScanLog();
+    log.frameIn(0, 0.0, 64, 48, 5);
+    log.points(new float[] {1, 2, 3, 4});
+    log.frameIn(1, 0.033, 64, 48, 6);
+    ScanLog.RequestEntry a = log.requestSent("TovraStateEngine-1-5", Collections.emptyMap(), new byte[0]);
+    ScanLog.RequestEntry b = log.requestSent("TovraStateEngine-1-6", Collections.emptyMap(), new byte[0]);
+    assertEquals(0, a.frameIndex);
+    assertEquals(1, b.frameIndex);
+    assertEquals(2, log.frames().get(0).pointCount());
+    assertEquals(0, log.frames().get(1).pointCount());
+
+    // b is answered first on another thread: its report must not land on the older a.
+    Thread t = new Thread(() -> {
+      log.answered("TovraStateEngine-1-6", 500, "boom", 0.010);
+      log.serverError(1, 500);
+    });
+    t.start();
+    t.join();
+    assertTrue(b.isError());
+    assertEquals(500, b.errorCode);
+    assertFalse(a.reported);
+    // A report with no answer on this thread goes to the oldest open request.
+    assertSame(a, log.decoded(Collections.emptyList(), "q1", true, Arrays.asList("q1")));
+    assertEquals(0, log.openRequests());
+    // A report with nothing open is counted, not attributed.
+    log.serverError(2, 200);
+    assertEquals(1, log.reportsWithoutRequest());
+  }
+
+  @Test
+  void summaryFiguresAndVerdict() {
+    List<Double> ms = Arrays.asList(10.0, 1.0, 9.0, 2.0, 8.0, 3.0, 7.0, 4.0, 6.0, 5.0);
+    assertEquals(5.0, Summary.percentile(ms, 50));
+    assertEquals(9.0, Summary.percentile(ms, 90));
+    assertEquals(10.0, Summary.percentile(ms, 100));
+    assertTrue(Double.isNaN(Summary.percentile(Collections.emptyList(), 50)));
+
+    ScanLog log = new ScanLog();
+    assertFalse(new Summary(log).ok(), "no frames, no requests");
+    log.frameIn(0, 0, 8, 8, 0);
+    log.points(new float[] {0, 0, 1, 1, 2, 2});
+    log.frameIn(1, 0, 8, 8, 1);
+    log.points(new float[] {0, 0});
+    log.requestSent("x-0", Collections.emptyMap(), new byte[0]);
+    log.answered("x-0", 200, "{}", 0.020);
+    log.decoded(Arrays.asList(new ScanLog.Result("BoundingBox", "", "{}", new float[8], null),
+        new ScanLog.Result("SearchTerms", "t", "{}", null, null)), "q", false, Collections.emptyList());
+    Summary s = new Summary(log);
+    assertEquals(2, s.frames);
+    assertEquals(1, s.minPoints);
+    assertEquals(3, s.maxPoints);
+    assertEquals(2.0, s.meanPoints, 1e-9);
+    assertEquals(2, s.results);
+    assertEquals(1, s.boxes);
+    assertEquals(20.0, s.p50Ms, 1e-9);
+    assertTrue(s.ok());
+    log.requestSent("x-1", Collections.emptyMap(), new byte[0]);
+    Summary open = new Summary(log);
+    assertEquals(1, open.unanswered);
+    assertFalse(open.ok());
+    assertTrue(open.lines().get(2).contains("2 sent, 1 replies (1 decoded, 0 errors, 1 unanswered)"), open.lines().get(2));
+  }
+
+  @Test
+  void reportShowsAnnotatedFramesAndEscapesServerText() throws IOException {
+    BufferedImage img = new BufferedImage(160, 120, BufferedImage.TYPE_INT_RGB);
+    ByteArrayOutputStream jpeg = new ByteArrayOutputStream();
+    ImageIO.write(img, "jpg", jpeg);
+    ScanLog log = new ScanLog();
+    log.frameIn(0, 0, 160, 120, 3);
+    log.points(new float[] {10, 10, 50, 60});
+    log.requestSent("TovraStateEngine-9-3", Collections.singletonMap("orientation", "90"), jpeg.toByteArray());
+    log.answered("TovraStateEngine-9-3", 200, "{}", 0.012);
+    float[] box = {20, 30, 100, 30, 100, 90, 20, 90};
+    log.decoded(Arrays.asList(new ScanLog.Result("BoundingBox", "<script>alert(1)</script>", "{}", box, null)), "q-1", true,
+        Arrays.asList("q-0", "q-1"));
+    log.requestSent("TovraStateEngine-9-4", Collections.emptyMap(), new byte[] {1, 2, 3}); // not a JPEG
+    log.answered("TovraStateEngine-9-4", -1, "transport: no answer", 0.001);
+    log.serverError(1, -1);
+
+    File dir = tmp.toFile();
+    File html = ReportWriter.write(dir, log, new Summary(log), new ReportWriter.Info());
+    String page = new String(Files.readAllBytes(html.toPath()), StandardCharsets.UTF_8);
+    assertFalse(page.contains("<script>alert"), "server text must be escaped");
+    assertTrue(page.contains("&lt;script&gt;alert(1)&lt;/script&gt;"));
+    assertTrue(page.contains("frames/request-0001.png"));
+    assertTrue(page.contains("data:image/jpeg;base64,"), "thumbnails are inline");
+    assertTrue(page.contains("error: status 1, code -1"));
+    assertTrue(page.contains("<svg class=\"timeline\""));
+    assertTrue(page.contains("scan had problems"));
+
+    BufferedImage annotated = ImageIO.read(new File(dir, "frames/request-0001.png"));
+    assertEquals(160, annotated.getWidth());
+    // The box outline is drawn in its colour on the left edge of the box.
+    int rgb = annotated.getRGB(20, 60) & 0xffffff;
+    assertTrue(((rgb >> 16) & 0xff) > 150 && (rgb & 0xff) > 80 && ((rgb >> 8) & 0xff) < 120, Integer.toHexString(rgb));
+    assertFalse(new File(dir, "frames/request-0002.png").exists(), "no PNG for an unreadable JPEG");
+  }
+}

@@ -1,0 +1,484 @@
+package com.orza.vs.tools.server;
+
+import com.sun.net.httpserver.HttpExchange;
+import com.sun.net.httpserver.HttpServer;
+import java.awt.image.BufferedImage;
+import java.io.ByteArrayInputStream;
+import java.io.ByteArrayOutputStream;
+import java.io.IOException;
+import java.io.InputStream;
+import java.io.OutputStream;
+import java.io.PrintStream;
+import java.net.InetAddress;
+import java.net.InetSocketAddress;
+import java.nio.charset.StandardCharsets;
+import java.security.SecureRandom;
+import java.util.ArrayList;
+import java.util.Iterator;
+import java.util.LinkedHashMap;
+import java.util.List;
+import java.util.Locale;
+import java.util.Map;
+import java.util.concurrent.ExecutorService;
+import java.util.concurrent.Executors;
+import java.util.concurrent.TimeUnit;
+import java.util.concurrent.atomic.AtomicInteger;
+import java.util.function.Consumer;
+import javax.imageio.ImageIO;
+import javax.imageio.ImageReader;
+import javax.imageio.stream.ImageInputStream;
+
+/**
+ * A local stand-in for the visual search server.
+ *
+ * <p>It accepts the multipart request a visual search transport sends (the JPEG frame as part
+ * "file", the form field "vsearch_params_json" and the metadata fields), finds the frame's most
+ * textured region and answers a reply document with a "BoundingBox" result around the region
+ * and a "SearchTerms" result describing what was measured, a fresh "queryId" and the
+ * "resultMetadata" of the query's accumulation session ({@link QuerySessions}).
+ *
+ * <p>Paths: {@code POST /vsearch} is the service. For failure-path tests, {@code /test/500}
+ * answers 500, {@code /test/notjson} answers 200 with a body that is not JSON, and
+ * {@code /test/slow/<ms>} waits that long (at most a minute) before answering normally. The
+ * options {@code delayMs} and {@code fail} apply the same behaviour to {@code /vsearch}.
+ */
+public final class ReferenceServer implements AutoCloseable {
+  /** Frames larger than this many pixels are refused before decoding (decompression bombs). */
+  static final long MAX_PIXELS = 40L * 1000 * 1000;
+  static final int MAX_SLOW_MS = 60_000;
+
+  /** Settings; the defaults make a loopback server on a free port. */
+  public static final class Options {
+    public String host = "127.0.0.1";
+    public int port = 0;
+    /** Extra wait before every answer of /vsearch, in milliseconds. */
+    public int delayMs = 0;
+    /** null for normal answers, "500" or "notjson" to make /vsearch fail that way. */
+    public String fail = null;
+    /** Queries per accumulation session. */
+    public int accumulate = 5;
+    public int maxBodyBytes = 16 * 1024 * 1024;
+    public int threads = 8;
+    /** Receives one line per request and the start-up lines; null discards them. */
+    public Consumer<String> log = System.out::println;
+  }
+
+  private final Options options;
+  private final QuerySessions sessions;
+  private final AtomicInteger requestCounter = new AtomicInteger();
+  private HttpServer http;
+  private ExecutorService executor;
+
+  public ReferenceServer(Options options) {
+    this.options = options;
+    byte[] tag = new byte[2];
+    new SecureRandom().nextBytes(tag);
+    this.sessions = new QuerySessions(String.format("%02x%02x", tag[0] & 0xff, tag[1] & 0xff), options.accumulate);
+  }
+
+  /** Binds and starts serving; returns this server. */
+  public synchronized ReferenceServer start() throws IOException {
+    if (http != null) return this;
+    http = HttpServer.create(new InetSocketAddress(InetAddress.getByName(options.host), options.port), 64);
+    executor = Executors.newFixedThreadPool(Math.max(1, options.threads), r -> {
+      Thread t = new Thread(r, "vsserver-http");
+      t.setDaemon(true);
+      return t;
+    });
+    http.setExecutor(executor);
+    http.createContext("/", this::handle);
+    http.start();
+    return this;
+  }
+
+  /** The bound port (after {@link #start()}). */
+  public synchronized int port() {
+    if (http == null) throw new IllegalStateException("server not started");
+    return http.getAddress().getPort();
+  }
+
+  /** http://host:port, without a path. */
+  public String baseUrl() {
+    String host = options.host.contains(":") ? "[" + options.host + "]" : options.host;
+    return "http://" + host + ":" + port();
+  }
+
+  /** The service's URL: {@code baseUrl() + "/vsearch"}. */
+  public String url() {
+    return baseUrl() + "/vsearch";
+  }
+
+  /** Number of requests received so far (any path). */
+  public int requestCount() {
+    return requestCounter.get();
+  }
+
+  @Override
+  public synchronized void close() {
+    if (http == null) return;
+    http.stop(0);
+    executor.shutdownNow();
+    try {
+      executor.awaitTermination(2, TimeUnit.SECONDS);
+    } catch (InterruptedException e) {
+      Thread.currentThread().interrupt();
+    }
+    http = null;
+  }
+
+  private void log(String line) {
+    Consumer<String> l = options.log;
+    if (l != null) l.accept(line);
+  }
+
+  // ---------------------------------------------------------------------------------------------
+  // Request handling
+
+  /** An answer with its status, content type and body, plus what the log line should say. */
+  static final class Answer {
+    final int status;
+    final String contentType;
+    final String body;
+    final String note;
+
+    Answer(int status, String contentType, String body, String note) {
+      this.status = status;
+      this.contentType = contentType;
+      this.body = body;
+      this.note = note;
+    }
+
+    static Answer error(int status, String message) {
+      Map<String, Object> doc = new LinkedHashMap<>();
+      doc.put("error", message);
+      return new Answer(status, "application/json", Json.write(doc), message);
+    }
+  }
+
+  private void handle(HttpExchange ex) throws IOException {
+    int n = requestCounter.incrementAndGet();
+    long start = System.nanoTime();
+    String path = ex.getRequestURI().getPath();
+    String method = ex.getRequestMethod();
+    String requestId = ex.getRequestHeaders().getFirst("X-Request-Id");
+    Answer answer;
+    try {
+      answer = route(ex, method, path);
+    } catch (Throwable t) {
+      answer = Answer.error(500, "internal error: " + t);
+    }
+    byte[] body = answer.body.getBytes(StandardCharsets.UTF_8);
+    try {
+      ex.getResponseHeaders().set("Content-Type", answer.contentType + "; charset=utf-8");
+      ex.getResponseHeaders().set("Cache-Control", "no-store");
+      if (answer.status == 405) ex.getResponseHeaders().set("Allow", "POST");
+      ex.sendResponseHeaders(answer.status, body.length == 0 ? -1 : body.length);
+      if (body.length > 0) {
+        try (OutputStream os = ex.getResponseBody()) {
+          os.write(body);
+        }
+      }
+    } catch (IOException e) {
+      // The client went away (for example after its own timeout); say so in the log line.
+      answer = new Answer(answer.status, answer.contentType, answer.body, answer.note + " (client gone: " + e.getMessage() + ")");
+    } finally {
+      ex.close();
+    }
+    long ms = (System.nanoTime() - start) / 1_000_000;
+    String remote = ex.getRemoteAddress() == null ? "?" : ex.getRemoteAddress().getAddress().getHostAddress();
+    log(String.format(Locale.ROOT, "vsserver: #%d %s %s %s%s -> %d %s [%d ms]", n, remote, method, path,
+        requestId == null ? "" : " id " + requestId, answer.status, answer.note, ms));
+  }
+
+  private Answer route(HttpExchange ex, String method, String path) throws IOException {
+    if (path.equals("/") || path.equals("/help")) {
+      if (!method.equals("GET") && !method.equals("HEAD")) return Answer.error(405, "use GET for " + path);
+      return new Answer(200, "text/plain", usage(), "help page");
+    }
+    boolean service = path.equals("/vsearch");
+    boolean hook = path.startsWith("/test/");
+    if (!service && !hook) return Answer.error(404, "no such path " + path + " (the service is POST /vsearch)");
+    if (!method.equals("POST")) return Answer.error(405, "use POST for " + path);
+
+    String fail = service ? options.fail : null;
+    int delay = service ? options.delayMs : 0;
+    if (hook) {
+      String what = path.substring("/test/".length());
+      if (what.equals("500") || what.equals("notjson")) {
+        fail = what;
+      } else if (what.startsWith("slow/")) {
+        try {
+          delay = Integer.parseInt(what.substring("slow/".length()));
+        } catch (NumberFormatException e) {
+          return Answer.error(404, "bad test hook " + path + " (use /test/slow/<milliseconds>)");
+        }
+      } else {
+        return Answer.error(404, "unknown test hook " + path + " (hooks: /test/500, /test/notjson, /test/slow/<ms>)");
+      }
+    }
+
+    // Read the body in every case, so that the client's upload completes before we answer.
+    byte[] body = readBody(ex);
+    if (body == null) return Answer.error(413, "request body over " + options.maxBodyBytes + " bytes");
+
+    if (delay > 0) {
+      try {
+        Thread.sleep(Math.min(delay, MAX_SLOW_MS));
+      } catch (InterruptedException e) {
+        Thread.currentThread().interrupt();
+        return Answer.error(503, "server shutting down");
+      }
+    }
+    if ("500".equals(fail)) return Answer.error(500, "test hook: internal server error");
+    if ("notjson".equals(fail)) {
+      return new Answer(200, "text/html", "<html><body>Service temporarily unavailable (test hook: not JSON)</body></html>",
+          "test hook: body that is not JSON");
+    }
+    return search(ex.getRequestHeaders().getFirst("Content-Type"), body);
+  }
+
+  /**
+   * The request body, or null when it is longer than the limit. An oversized body is still read
+   * and discarded (up to a few times the limit) so that the client, which is still sending,
+   * receives the 413 answer instead of a reset connection.
+   */
+  private byte[] readBody(HttpExchange ex) throws IOException {
+    ByteArrayOutputStream out = new ByteArrayOutputStream();
+    byte[] buf = new byte[16384];
+    long total = 0;
+    long drainLimit = 4L * options.maxBodyBytes;
+    try (InputStream in = ex.getRequestBody()) {
+      int r;
+      while ((r = in.read(buf)) > 0) {
+        total += r;
+        if (total > drainLimit) break;
+        if (total <= options.maxBodyBytes) out.write(buf, 0, r);
+      }
+    }
+    return total > options.maxBodyBytes ? null : out.toByteArray();
+  }
+
+  /** The service itself: checks the request, analyses the frame, builds the reply. */
+  Answer search(String contentType, byte[] body) {
+    String boundary = Multipart.boundaryOf(contentType);
+    if (boundary == null) return Answer.error(400, "expected multipart/form-data with a boundary, got " + contentType);
+    Multipart form;
+    try {
+      form = Multipart.parse(body, boundary);
+    } catch (IllegalArgumentException e) {
+      return Answer.error(400, "bad multipart body: " + e.getMessage());
+    }
+    byte[] jpeg = form.files.get("file");
+    if (jpeg == null) return Answer.error(400, "missing file part \"file\"");
+    String paramsText = form.fields.get("vsearch_params_json");
+    if (paramsText == null) return Answer.error(400, "missing form field \"vsearch_params_json\"");
+    Object params;
+    try {
+      params = Json.parse(paramsText);
+    } catch (IllegalArgumentException e) {
+      return Answer.error(400, "vsearch_params_json is not JSON: " + e.getMessage());
+    }
+    Object imageSlot = Json.member(Json.member(Json.member(params, "quillmark"), "file_list"), "p_img_1");
+    if (!"file".equals(imageSlot)) {
+      return Answer.error(400, "vsearch_params_json lacks quillmark.file_list.p_img_1 = \"file\"");
+    }
+    Object rotation = Json.member(Json.member(Json.member(params, "quillmark"), "params"), "rotation");
+
+    BufferedImage image;
+    try {
+      image = decode(jpeg);
+    } catch (IllegalArgumentException e) {
+      return Answer.error(413, e.getMessage());
+    } catch (IOException e) {
+      return Answer.error(415, "file part is not a readable image: " + e.getMessage());
+    }
+    if (image == null) return Answer.error(415, "file part is not a readable image");
+
+    TextureRegionFinder.Result r = TextureRegionFinder.analyse(image);
+    QuerySessions.Entry q = sessions.next(form.fields.get("lastQueryId"));
+
+    List<Object> results = new ArrayList<>();
+    String measured;
+    if (r.found) {
+      Map<String, Object> box = new LinkedHashMap<>();
+      box.put("tlx", r.left);
+      box.put("tly", r.top);
+      box.put("trx", r.right);
+      box.put("try", r.top);
+      box.put("brx", r.right);
+      box.put("bry", r.bottom);
+      box.put("blx", r.left);
+      box.put("bly", r.bottom);
+      Map<String, Object> props = new LinkedHashMap<>();
+      props.put("boundingBox", box);
+      props.put("energy", round1(r.regionEnergy));
+      Map<String, Object> result = new LinkedHashMap<>();
+      result.put("content", "textured region");
+      result.put("contentType", "BoundingBox");
+      result.put("properties", props);
+      results.add(result);
+      measured = String.format(Locale.ROOT, "texture energy %.1f in %dx%d at (%d,%d) of %dx%d, brightness %.2f",
+          r.regionEnergy, r.width(), r.height(), r.left, r.top, r.frameWidth, r.frameHeight, r.brightness);
+    } else {
+      measured = String.format(Locale.ROOT, "no textured region in %dx%d (frame energy %.1f), brightness %.2f",
+          r.frameWidth, r.frameHeight, r.frameEnergy, r.brightness);
+    }
+    Map<String, Object> termProps = new LinkedHashMap<>();
+    termProps.put("frameEnergy", round1(r.frameEnergy));
+    termProps.put("brightness", Math.round(r.brightness * 1000) / 1000.0);
+    termProps.put("frameWidth", r.frameWidth);
+    termProps.put("frameHeight", r.frameHeight);
+    termProps.put("rotation", rotation == null ? "" : String.valueOf(rotation));
+    String orientation = form.fields.get("orientation");
+    if (orientation != null) termProps.put("orientation", orientation);
+    Map<String, Object> terms = new LinkedHashMap<>();
+    terms.put("content", measured);
+    terms.put("contentType", "SearchTerms");
+    terms.put("properties", termProps);
+    results.add(terms);
+
+    Map<String, Object> meta = new LinkedHashMap<>();
+    meta.put("finalAccumulation", q.isFinal);
+    meta.put("accumulatedQueries", q.accumulated);
+    Map<String, Object> quillmark = new LinkedHashMap<>();
+    quillmark.put("searchResult", results);
+    quillmark.put("resultMetadata", meta);
+    Map<String, Object> doc = new LinkedHashMap<>();
+    doc.put("queryId", q.queryId);
+    doc.put("quillmark", quillmark);
+
+    String note = String.format(Locale.ROOT, "%s session %d (%d/%d%s) %dx%d, %.1f KB JPEG, rotation %s: %s",
+        q.queryId, q.session, q.accumulated.size(), Math.max(1, options.accumulate), q.isFinal ? ", final" : "",
+        r.frameWidth, r.frameHeight, jpeg.length / 1024.0, rotation, measured);
+    return new Answer(200, "application/json", Json.write(doc), note);
+  }
+
+  private static double round1(double v) {
+    return Math.round(v * 10) / 10.0;
+  }
+
+  /**
+   * Decodes an image after checking its declared size, so that a small file that claims a huge
+   * frame cannot exhaust memory. Returns null when no reader recognises the bytes.
+   */
+  static BufferedImage decode(byte[] bytes) throws IOException {
+    try (ImageInputStream in = ImageIO.createImageInputStream(new ByteArrayInputStream(bytes))) {
+      if (in == null) return null;
+      Iterator<ImageReader> readers = ImageIO.getImageReaders(in);
+      if (!readers.hasNext()) return null;
+      ImageReader reader = readers.next();
+      try {
+        reader.setInput(in, true, true);
+        long pixels = (long) reader.getWidth(0) * reader.getHeight(0);
+        if (pixels > MAX_PIXELS) {
+          throw new IllegalArgumentException("frame of " + reader.getWidth(0) + "x" + reader.getHeight(0) + " is too large");
+        }
+        return reader.read(0);
+      } finally {
+        reader.dispose();
+      }
+    }
+  }
+
+  // ---------------------------------------------------------------------------------------------
+  // Command line
+
+  static String usage() {
+    return String.join("\n",
+        "vsserver: a local reference visual search server",
+        "",
+        "usage: vsserver [--host ADDR] [--port N] [--delay MS] [--fail 500|notjson] [--accumulate N] [--quiet]",
+        "",
+        "  --host ADDR       address to bind (default 127.0.0.1, loopback only; 0.0.0.0 exposes it to the network)",
+        "  --port N          port to bind (default 0: a free port, printed at start)",
+        "  --delay MS        wait MS milliseconds before every answer of /vsearch",
+        "  --fail 500        make /vsearch answer 500; --fail notjson: answer 200 with a body that is not JSON",
+        "  --accumulate N    queries per accumulation session (default 5); the N-th reply is final",
+        "  --quiet           no log line per request",
+        "  --help            this text",
+        "",
+        "POST /vsearch takes multipart/form-data: the JPEG frame as part \"file\", the field",
+        "\"vsearch_params_json\" and the metadata fields (\"lastQueryId\" links queries into a session).",
+        "It answers a JSON reply: a \"BoundingBox\" result around the most textured region (frame",
+        "pixels) and a \"SearchTerms\" result that describes what was measured.",
+        "Test hooks (POST): /test/500, /test/notjson, /test/slow/<ms>.",
+        "");
+  }
+
+  /** Parses command-line options; throws IllegalArgumentException with a message on bad input. */
+  static Options parseArgs(String[] args, PrintStream out) {
+    Options o = new Options();
+    for (int i = 0; i < args.length; i++) {
+      String a = args[i];
+      switch (a) {
+        case "--host": o.host = value(args, ++i, a); break;
+        case "--port": o.port = intValue(args, ++i, a, 0, 65535); break;
+        case "--delay": o.delayMs = intValue(args, ++i, a, 0, MAX_SLOW_MS); break;
+        case "--accumulate": o.accumulate = intValue(args, ++i, a, 1, 1_000_000); break;
+        case "--fail":
+          o.fail = value(args, ++i, a);
+          if (!o.fail.equals("500") && !o.fail.equals("notjson")) {
+            throw new IllegalArgumentException("--fail takes 500 or notjson, not " + o.fail);
+          }
+          break;
+        case "--quiet": o.log = null; break;
+        case "--help":
+        case "-h":
+          return null;
+        default:
+          throw new IllegalArgumentException("unknown option " + a);
+      }
+    }
+    if (o.log != null) o.log = out::println;
+    return o;
+  }
+
+  static String value(String[] args, int i, String name) {
+    if (i >= args.length) throw new IllegalArgumentException(name + " needs a value");
+    return args[i];
+  }
+
+  static int intValue(String[] args, int i, String name, int min, int max) {
+    String v = value(args, i, name);
+    try {
+      int n = Integer.parseInt(v);
+      if (n < min || n > max) throw new IllegalArgumentException(name + " must be between " + min + " and " + max);
+      return n;
+    } catch (NumberFormatException e) {
+      throw new IllegalArgumentException(name + " takes a number, not " + v);
+    }
+  }
+
+  public static void main(String[] args) throws Exception {
+    Options o;
+    try {
+      o = parseArgs(args, System.out);
+    } catch (IllegalArgumentException e) {
+      System.err.println("vsserver: " + e.getMessage());
+      System.err.print(usage());
+      System.exit(2);
+      return;
+    }
+    if (o == null) {
+      System.out.print(usage());
+      return;
+    }
+    ReferenceServer server = new ReferenceServer(o);
+    try {
+      server.start();
+    } catch (IOException e) {
+      System.err.println("vsserver: cannot listen on " + o.host + ":" + o.port + ": " + e.getMessage());
+      System.exit(1);
+      return;
+    }
+    Runtime.getRuntime().addShutdownHook(new Thread(server::close));
+    if (!InetAddress.getByName(o.host).isLoopbackAddress()) {
+      System.out.println("vsserver: warning: listening beyond loopback (" + o.host + "): anyone on the network can reach it");
+    }
+    System.out.println("vsserver: listening on " + server.url()
+        + (o.fail != null ? " (failing: " + o.fail + ")" : "") + (o.delayMs > 0 ? " (delay " + o.delayMs + " ms)" : ""));
+    System.out.println("vsserver: test hooks " + server.baseUrl() + "/test/500, /test/notjson, /test/slow/<ms>; Ctrl-C stops");
+    System.out.flush();
+    Thread.currentThread().join(); // serve until killed
+  }
+}

@@ -66,12 +66,14 @@ void runJpegBench(const std::vector<const BenchFrame*>& frames) {
     nv21ToI420(f, i420.data());
 
     auto oursNv21 = [&] {
-      if (!Tovra::encodeYUVToJpeg(f.nv21.data(), f.height, f.width, f.width, OrzaVSMobile::NV21, out, kQuality, work))
+      if (!Tovra::encodeYUVToJpeg(f.nv21.data(), f.height, f.width, f.width, OrzaVSMobile::NV21, out,
+                                  kQuality, work))
         std::printf("encode failed\n");
       keep(out.data());
     };
     auto oursI420 = [&] {
-      Tovra::encodeYUVToJpeg(i420.data(), f.height, f.width, f.width, OrzaVSMobile::I420, out, kQuality, work);
+      Tovra::encodeYUVToJpeg(i420.data(), f.height, f.width, f.width, OrzaVSMobile::I420, out, kQuality,
+                             work);
       keep(out.data());
     };
     const Timing ours = measure(oursNv21);
@@ -110,8 +112,8 @@ void runJpegBench(const std::vector<const BenchFrame*>& frames) {
     tjFree(tjBuf);
     tjDestroy(tj);
 #else
-    std::printf("  %-18s %-34s %zu bytes (TurboJPEG not found: no peer)\n", f.name.c_str(), "ours NV21 stream",
-                oursStream.size());
+    std::printf("  %-18s %-34s %zu bytes (TurboJPEG not found: no peer)\n", f.name.c_str(),
+                "ours NV21 stream", oursStream.size());
 #endif
 
     const std::vector<uint8_t> bgr = nv21ToBgr(f);
@@ -121,8 +123,8 @@ void runJpegBench(const std::vector<const BenchFrame*>& frames) {
                   keep(out.data());
                 }));
     printTiming(f.name, "ours packed BGR", measure([&] {
-                  Tovra::encodePackedToJpeg(bgr.data(), f.height, f.width, f.width * 3, 3, OrzaVSMobile::BGR, out,
-                                            kQuality, work);
+                  Tovra::encodePackedToJpeg(bgr.data(), f.height, f.width, f.width * 3, 3, OrzaVSMobile::BGR,
+                                            out, kQuality, work);
                   keep(out.data());
                 }));
   }

@@ -14,8 +14,6 @@
 // frame; decoded results carry the module and no unknown content type; server errors carry
 // the status that matches the code; and never more result callbacks than requests sent.
 
-#include <fuzzer/FuzzedDataProvider.h>
-
 #include <algorithm>
 #include <atomic>
 #include <chrono>
@@ -164,50 +162,80 @@ const char* const kBodies[] = {
     "<html>502 Bad Gateway</html>",
     "",
 };
+constexpr size_t kBodyCount = sizeof(kBodies) / sizeof(kBodies[0]);
 
-Reply pickReply(FuzzedDataProvider& in) {
-  Reply r;
-  switch (in.ConsumeIntegralInRange(0, 5)) {
-    case 0: r.code = 500; break;
-    case 1: r.code = in.ConsumeIntegral<int32_t>(); break;
-    default: r.code = 200; break;
+// Reads the input from the front in fixed-size fields, so that a seed can be written by hand
+// (fuzz/make_engine_seeds.py) and a mutation changes one field. Past the end every read is 0.
+class Reader {
+ public:
+  Reader(const uint8_t* data, size_t size) : p_(data), end_(data + size) {}
+  bool done() const { return p_ >= end_; }
+  uint8_t u8() { return p_ < end_ ? *p_++ : 0; }
+  uint32_t u32() {
+    uint32_t v = 0;
+    for (int i = 0; i < 4; ++i) v |= static_cast<uint32_t>(u8()) << (8 * i);
+    return v;
   }
-  const size_t pick = in.ConsumeIntegralInRange<size_t>(0, sizeof(kBodies) / sizeof(kBodies[0]));
-  r.body = pick < sizeof(kBodies) / sizeof(kBodies[0]) ? kBodies[pick] : in.ConsumeRandomLengthString(256);
-  r.roundTrip = in.ConsumeBool() ? -1.0 : in.ConsumeFloatingPoint<double>();
-  return r;
-}
+  int32_t i32() { return static_cast<int32_t>(u32()); }
+  // A selector byte and a 32-bit value: 255 takes the value as it is, other selectors map it
+  // into ranges worth trying.
+  int32_t dimension() {
+    const uint8_t sel = u8();
+    const uint32_t v = u32();
+    if (sel == 255) return static_cast<int32_t>(v);
+    switch (sel % 10) {
+      case 0: return -static_cast<int32_t>(v % 1000);
+      case 1: return 1 + static_cast<int32_t>(v % 6);
+      case 2: return INT32_MAX;
+      case 3: return 100 + static_cast<int32_t>(v % 300);
+      default: return 7 + static_cast<int32_t>(v % 58);
+    }
+  }
+  int32_t format() {
+    const uint8_t sel = u8();
+    const uint32_t v = u32();
+    if (sel == 255) return static_cast<int32_t>(v);
+    switch (sel % 8) {
+      case 0: return static_cast<int32_t>(v);
+      case 1: return 3 + static_cast<int32_t>(v % 4);
+      case 2: return OrzaVSMobile::GRAY;
+      default: return static_cast<int32_t>(v % 3);
+    }
+  }
+  // A row stride relative to a row of `rowBytes` bytes.
+  int32_t stride(int64_t rowBytes) {
+    const uint8_t sel = u8();
+    const uint32_t v = u32();
+    int64_t stride;
+    if (sel == 255) return static_cast<int32_t>(v);
+    switch (sel % 8) {
+      case 0: stride = static_cast<int32_t>(v); break;
+      case 1: stride = rowBytes - 1 - static_cast<int64_t>(v % 8); break;
+      default: stride = rowBytes + static_cast<int64_t>(v % 25); break;
+    }
+    return static_cast<int32_t>(std::max<int64_t>(INT32_MIN, std::min<int64_t>(INT32_MAX, stride)));
+  }
+  Reply reply() {
+    Reply r;
+    const uint8_t code = u8();
+    const uint32_t v = u32();
+    r.code = code == 255 ? static_cast<int32_t>(v) : (code % 4 == 0 ? 500 : 200);
+    const uint8_t body = u8();
+    if (body % (kBodyCount + 1) < kBodyCount) {
+      r.body = kBodies[body % (kBodyCount + 1)];
+    } else {
+      const size_t n = u8();
+      for (size_t i = 0; i < n; ++i) r.body.push_back(static_cast<char>(u8()));
+    }
+    const uint8_t rtt = u8();
+    r.roundTrip = rtt == 0 ? -1.0 : rtt / 10.0;
+    return r;
+  }
 
-int32_t pickDimension(FuzzedDataProvider& in) {
-  switch (in.ConsumeIntegralInRange(0, 9)) {
-    case 0: return in.ConsumeIntegralInRange<int32_t>(INT32_MIN, 0);
-    case 1: return in.ConsumeIntegralInRange<int32_t>(1, 6);
-    case 2: return INT32_MAX;
-    case 3: return in.ConsumeIntegralInRange<int32_t>(100, 400);
-    default: return in.ConsumeIntegralInRange<int32_t>(7, 64);
-  }
-}
-
-int32_t pickFormat(FuzzedDataProvider& in) {
-  switch (in.ConsumeIntegralInRange(0, 9)) {
-    case 0: return in.ConsumeIntegral<int32_t>();
-    case 1: return in.ConsumeIntegralInRange(3, 6);
-    case 2: return OrzaVSMobile::GRAY;
-    default: return in.ConsumeIntegralInRange(0, 2);
-  }
-}
-
-int32_t pickStride(FuzzedDataProvider& in, int32_t width, int32_t numChannels) {
-  const int64_t row = static_cast<int64_t>(width) * (numChannels > 1 ? numChannels : 1);
-  int64_t stride;
-  switch (in.ConsumeIntegralInRange(0, 7)) {
-    case 0: stride = in.ConsumeIntegral<int32_t>(); break;
-    case 1: stride = row - in.ConsumeIntegralInRange(1, 8); break;
-    case 2: stride = width; break;
-    default: stride = row + in.ConsumeIntegralInRange(0, 24); break;
-  }
-  return static_cast<int32_t>(std::max<int64_t>(INT32_MIN, std::min<int64_t>(INT32_MAX, stride)));
-}
+ private:
+  const uint8_t* p_;
+  const uint8_t* end_;
+};
 
 // Bytes the engine copies from a frame of this geometry (one plane, or 3/2 of it for YUV);
 // -1 when it is too large to hand over here.
@@ -219,14 +247,31 @@ int64_t frameBytes(const ImageBuffer& image) {
   return size;
 }
 
-void fillBytes(FuzzedDataProvider& in, uint8_t* dst, size_t n) {
+// Pixels with something to find: noise, a flat plane (sharpness 0, no corners), a flat plane
+// with bright and dark spots (isolated corners), or blocks (corners at every block corner).
+void fillPixels(uint8_t mode, uint32_t seed, uint8_t* dst, size_t n, int32_t stride) {
   if (dst == nullptr || n == 0) return;
-  const std::vector<uint8_t> bytes = in.ConsumeBytes<uint8_t>(in.ConsumeIntegralInRange<size_t>(0, 256));
-  if (bytes.empty()) {
-    std::memset(dst, 0x80, n);
-    return;
+  uint32_t state = seed | 1u;
+  auto next = [&state]() {
+    state ^= state << 13;
+    state ^= state >> 17;
+    state ^= state << 5;
+    return state;
+  };
+  const size_t row = stride > 0 ? static_cast<size_t>(stride) : 1;
+  const uint8_t flat = static_cast<uint8_t>(state >> 24);
+  for (size_t i = 0; i < n; ++i) {
+    switch (mode % 4) {
+      case 0: dst[i] = static_cast<uint8_t>(next()); break;
+      case 1: dst[i] = flat; break;
+      case 2: dst[i] = (next() % 61 == 0) ? static_cast<uint8_t>(flat ^ 0xC0) : flat; break;
+      default: dst[i] = (((i % row) / 6 + (i / row) / 6) & 1) ? 200 : 30; break;
+    }
   }
-  for (size_t i = 0; i < n; ++i) dst[i] = bytes[i % bytes.size()];
+}
+
+int32_t nudge(int32_t value, int delta) {
+  return static_cast<int32_t>(std::max<int64_t>(INT32_MIN, std::min<int64_t>(INT32_MAX, static_cast<int64_t>(value) + delta)));
 }
 
 // A frame in the caller's memory: borrowed (exactly the bytes its geometry names, followed by
@@ -237,20 +282,29 @@ struct ClientFrame {
   std::unique_ptr<GuardedBlock> block;
 };
 
-bool makeFrame(FuzzedDataProvider& in, ClientFrame& frame) {
+void describe(Reader& in, ImageBuffer& img) {
+  img.format = static_cast<OrzaVSMobile::ImageFormat>(in.format());
+  img.width = in.dimension();
+  img.height = in.dimension();
+  img.numChannels = static_cast<int32_t>(in.u8() % 7) - 1;
+  img.widthStep = in.stride(static_cast<int64_t>(img.width) * (img.numChannels > 1 ? img.numChannels : 1));
+}
+
+bool makeFrame(Reader& in, ClientFrame& frame) {
   ImageBuffer& img = frame.image;
-  img.format = static_cast<OrzaVSMobile::ImageFormat>(pickFormat(in));
-  img.width = pickDimension(in);
-  img.height = pickDimension(in);
-  img.numChannels = in.ConsumeIntegralInRange<int32_t>(-1, 5);
-  img.widthStep = pickStride(in, img.width, img.numChannels);
-  img.definition = in.ConsumeIntegral<int32_t>();
+  describe(in, img);
+  const uint8_t memory = in.u8();
+  const int delta = static_cast<int>(in.u8() % 129) - 64;
+  const uint8_t pixelMode = in.u8();
+  const uint32_t seed = in.u32();
   const int64_t bytes = frameBytes(img);
   if (bytes < 0) return false;
-  switch (in.ConsumeIntegralInRange(0, 5)) {
+  switch (memory % 6) {
     case 0: {
-      const int64_t n = std::max<int64_t>(0, bytes + in.ConsumeIntegralInRange(-64, 64));
-      if (img.allocateBuffer(static_cast<int32_t>(n)) > 0) fillBytes(in, img.data, static_cast<size_t>(n));
+      const int64_t n = std::max<int64_t>(0, bytes + delta);
+      if (img.allocateBuffer(static_cast<int32_t>(n)) > 0) {
+        fillPixels(pixelMode, seed, img.data, static_cast<size_t>(n), img.widthStep);
+      }
       break;
     }
     case 1:
@@ -258,32 +312,33 @@ bool makeFrame(FuzzedDataProvider& in, ClientFrame& frame) {
       break;
     default:
       frame.block = std::make_unique<GuardedBlock>(static_cast<size_t>(bytes));
-      fillBytes(in, frame.block->data(), frame.block->size());
+      fillPixels(pixelMode, seed, frame.block->data(), frame.block->size(), img.widthStep);
       img.data = frame.block->data();
       break;
   }
   return true;
 }
 
-double nextTimeStamp(FuzzedDataProvider& in, double& clock) {
-  switch (in.ConsumeIntegralInRange(0, 11)) {
+double nextTimeStamp(Reader& in, double& clock) {
+  const uint8_t sel = in.u8();
+  const uint32_t v = in.u32();
+  switch (sel % 12) {
     case 0: return std::numeric_limits<double>::quiet_NaN();
     case 1: return -1.0;
-    case 2: return in.ConsumeFloatingPoint<double>();
+    case 2: return static_cast<int32_t>(v) / 1000.0;
     case 3: clock += 0.1; return clock;
     case 4: clock += 0.41; return clock;
-    default: clock += in.ConsumeFloatingPointInRange(0.0, 0.3); return clock;
+    case 5: return std::numeric_limits<double>::infinity();
+    default: clock += (v % 300) / 1000.0; return clock;
   }
 }
 
-void fillExtra(FuzzedDataProvider& in, ExtraFrameData& extra, double& clock) {
+void fillExtra(Reader& in, ExtraFrameData& extra, double& clock) {
   extra.timeStamp = nextTimeStamp(in, clock);
-  extra.screenOrient = in.ConsumeBool() ? 90 * in.ConsumeIntegralInRange(-2, 4) : in.ConsumeIntegral<int32_t>();
-  extra.flat = in.ConsumeBool();
-}
-
-int32_t nudge(int32_t value, int delta) {
-  return static_cast<int32_t>(std::max<int64_t>(INT32_MIN, std::min<int64_t>(INT32_MAX, static_cast<int64_t>(value) + delta)));
+  const uint8_t sel = in.u8();
+  const int32_t orient = in.i32();
+  extra.screenOrient = sel == 255 ? orient : 90 * (static_cast<int>(sel % 7) - 2);
+  extra.flat = in.u8() & 1;
 }
 
 // A buffer lent by requestImageBuffer, with the key naming it and the number of resets the
@@ -293,42 +348,62 @@ struct Lent {
   ImageBuffer buffer;
   std::string key;
   int resetsAtLending = 0;
+  bool returned = false;  // its key went back to the engine: the client lets go of the memory
 };
 
+// Ops and their fields (each field has a fixed size; see make_engine_seeds.py):
+//   0 lifecycle      which(1)            start, stop, pause, resume; waits for the worker first
+//   1 lifecycle      which(1) wait(1)    the same, waiting only when wait is odd
+//   2 process        frame, extra, key(1)
+//   3 request        description         requestImageBuffer, then the camera fills the memory
+//   4 process lent   pick(1) change(1) value(4) extra, key(1)
+//   5 still image    frame, extra, reply
+//   6 push reply     which(1) reply
+//   7 transport mode mode(1) reply
+//   8 wait           (none)              up to 10 ms for the worker's next request
+//   9 recreate       (none)              destroy the engine (replies still out), build a new one
+//  10 configure      which(1) id(4)      delegates, only while stopped
+//  11 write lent     pick(1) allocLen(1+4) count(1)
+// where frame = description, memory(1) delta(1), pixels: mode(1) seed(4);
+//       description = format(5) width(5) height(5) channels(1) stride(5);
+//       extra = time(5) orientation(1+4) flat(1); reply = code(1+4) body(1 [+1+n]) rtt(1).
 class Harness {
  public:
-  explicit Harness(FuzzedDataProvider& in) : in_(in) { createEngine(); }
+  explicit Harness(Reader& in) : in_(in) { createEngine(); }
 
   ~Harness() {
     settle();
     engine_.reset();
-    // Late replies to every request ever sent: the engines that sent them are gone (or have
-    // moved on), so nothing may reach a destroyed job.
+    // Late replies to every request ever sent: the engines that sent them are gone, so nothing
+    // may reach a destroyed job.
     for (const std::string& id : transport_.ids()) transport_.push(id, Reply());
     FUZZ_CHECK(events_.results.load() <= static_cast<int>(transport_.ids().size()));
   }
 
   void step() {
-    switch (in_.ConsumeIntegralInRange(0, 19)) {
-      case 0: lifecycle(in_.ConsumeIntegralInRange(0, 3), true); break;
-      case 1: lifecycle(in_.ConsumeIntegralInRange(0, 3), in_.ConsumeIntegralInRange(0, 7) != 0); break;
-      case 2:
-      case 3:
-      case 4: processFrame(); break;
-      case 5: requestBuffer(); break;
-      case 6:
-      case 7: processLent(); break;
-      case 8: processSingle(); break;
-      case 9:
-      case 10: pushReply(); break;
-      case 11: transport_.setMode(static_cast<Mode>(in_.ConsumeIntegralInRange(0, static_cast<int>(Mode::kCount) - 1)),
-                                  pickReply(in_));
+    const int op = in_.u8() % 12;
+    if (orzavs_fuzz::verbose()) std::fprintf(stderr, "op %d\n", op);
+    switch (op) {
+      case 0: lifecycle(in_.u8() % 4, true); break;
+      case 1: {
+        const int which = in_.u8() % 4;
+        lifecycle(which, (in_.u8() & 1) != 0);
         break;
-      case 12: waitForRequest(); break;
-      case 13: recreate(); break;
-      case 14: configure(); break;
-      case 15: writeLent(); break;
-      default: processFrame(); break;
+      }
+      case 2: processFrame(); break;
+      case 3: requestBuffer(); break;
+      case 4: processLent(); break;
+      case 5: processSingle(); break;
+      case 6: pushReply(); break;
+      case 7: {
+        const Mode mode = static_cast<Mode>(in_.u8() % static_cast<int>(Mode::kCount));
+        transport_.setMode(mode, in_.reply());
+        break;
+      }
+      case 8: waitForRequest(); break;
+      case 9: recreate(); break;
+      case 10: configure(); break;
+      default: writeLent(); break;
     }
   }
 
@@ -384,101 +459,129 @@ class Harness {
     FUZZ_CHECK((engine_->executor() != nullptr) == (state_ != Tovra::STOPPED));
   }
 
+  // The key passed with a frame. Every process call hands its key back to the engine, so
+  // the lent buffer it names is the client's no longer.
+  std::string pickKey(const std::string& own) {
+    const uint8_t sel = in_.u8();
+    std::string key;
+    switch (sel % 8) {
+      case 0: break;
+      case 1: key = "1700000000-" + std::to_string(sel); break;
+      case 2: if (!lent_.empty()) key = lent_[sel % lent_.size()].key; break;
+      default: key = own; break;
+    }
+    for (Lent& l : lent_) {
+      if (!key.empty() && l.key == key) l.returned = true;
+    }
+    return key;
+  }
+
   void processFrame() {
     ClientFrame frame;
-    if (!makeFrame(in_, frame)) return;
+    const bool ok = makeFrame(in_, frame);
     ExtraFrameData extra;
     fillExtra(in_, extra, clock_);
+    const std::string key = pickKey(std::string());
+    if (!ok) return;
     events_.frameWidth = frame.image.width;
     events_.frameHeight = frame.image.height;
-    std::string key;
-    switch (in_.ConsumeIntegralInRange(0, 3)) {
-      case 0: key = in_.ConsumeRandomLengthString(24); break;
-      case 1: if (!lent_.empty()) key = lent_[in_.ConsumeIntegralInRange<size_t>(0, lent_.size() - 1)].key; break;
-      default: break;
+    if (orzavs_fuzz::verbose()) {
+      std::fprintf(stderr, "  process format %d %dx%d stride %d t %.3f key '%s'\n", frame.image.format,
+                   frame.image.width, frame.image.height, frame.image.widthStep, extra.timeStamp, key.c_str());
     }
     engine_->process(key, frame.image, extra);
   }
 
   void requestBuffer() {
     Lent l;
-    l.buffer.format = static_cast<OrzaVSMobile::ImageFormat>(pickFormat(in_));
-    l.buffer.width = pickDimension(in_);
-    l.buffer.height = pickDimension(in_);
-    l.buffer.numChannels = in_.ConsumeIntegralInRange<int32_t>(-1, 4);
-    l.buffer.widthStep = pickStride(in_, l.buffer.width, l.buffer.numChannels);
+    describe(in_, l.buffer);
+    const uint8_t pixelMode = in_.u8();
+    const uint32_t seed = in_.u32();
     if (frameBytes(l.buffer) < 0) return;
     engine_->requestImageBuffer(l.buffer, l.key);
-    if (l.key.empty()) {
-      FUZZ_CHECK(l.buffer.allocLen == 0 || state_ == Tovra::RUNNING);
-      return;
-    }
+    if (l.key.empty()) return;
+    FUZZ_CHECK(state_ == Tovra::RUNNING);
     FUZZ_CHECK(l.buffer.knownLength() == l.buffer.allocLen);
-    // The camera writes the frame into the lent memory, using all of it.
-    fillBytes(in_, l.buffer.data, static_cast<size_t>(l.buffer.allocLen));
+    // The camera writes the frame into the lent memory, all of it.
+    fillPixels(pixelMode, seed, l.buffer.data, static_cast<size_t>(l.buffer.allocLen), l.buffer.widthStep);
     l.resetsAtLending = resets_;
     lent_.push_back(std::move(l));
   }
 
-  Lent* pickLent() {
+  Lent* pickLent(uint8_t sel) {
     if (lent_.empty()) return nullptr;
-    Lent& l = lent_[in_.ConsumeIntegralInRange<size_t>(0, lent_.size() - 1)];
-    // Beyond one reset the engine has let the memory go; a client must not touch it then.
-    return resets_ - l.resetsAtLending <= 1 ? &l : nullptr;
+    Lent& l = lent_[sel % lent_.size()];
+    // Once its key went back to the engine, or beyond one reset, the engine has let the memory
+    // go; a client must not touch it then.
+    return !l.returned && resets_ - l.resetsAtLending <= 1 ? &l : nullptr;
   }
 
   void writeLent() {
-    Lent* l = pickLent();
+    Lent* l = pickLent(in_.u8());
+    const uint8_t sel = in_.u8();
+    const int32_t allocLen = in_.i32();
+    const size_t count = static_cast<size_t>(in_.u8()) * 16;
     if (l == nullptr || l->buffer.data == nullptr) return;
-    // A fill through the buffer, as the Java side makes it; it never writes past the block.
-    const std::vector<uint8_t> bytes = in_.ConsumeBytes<uint8_t>(in_.ConsumeIntegralInRange<size_t>(0, 1024));
-    l->buffer.allocLen = in_.ConsumeBool() ? l->buffer.allocLen : in_.ConsumeIntegral<int32_t>();
+    // A fill through the buffer, as the Java side makes it: never past the lent block, whatever
+    // allocLen says.
+    if (sel & 1) l->buffer.allocLen = allocLen;
+    std::vector<uint8_t> bytes(count, sel);
     l->buffer.fillBuffer(bytes.data(), static_cast<int32_t>(bytes.size()));
   }
 
   void processLent() {
-    Lent* l = pickLent();
-    if (l == nullptr) return;
+    Lent* l = pickLent(in_.u8());
+    const uint8_t change = in_.u8();
+    const int32_t value = in_.i32();
+    ExtraFrameData extra;
+    fillExtra(in_, extra, clock_);
+    if (l == nullptr) {
+      pickKey(std::string());
+      return;
+    }
     ImageBuffer& image = l->buffer;
     // The client fills in the rest of the description, not always consistently with what it
     // asked the memory for.
-    switch (in_.ConsumeIntegralInRange(0, 5)) {
-      case 0: image.height = nudge(image.height, in_.ConsumeIntegralInRange(-3, 3)); break;
-      case 1: image.format = static_cast<OrzaVSMobile::ImageFormat>(pickFormat(in_)); break;
-      case 2: image.widthStep = nudge(image.widthStep, in_.ConsumeIntegralInRange(-3, 3)); break;
-      case 3: image.width = pickDimension(in_); break;
+    switch (change % 8) {
+      case 0: image.height = nudge(image.height, value % 4); break;
+      case 1: image.format = static_cast<OrzaVSMobile::ImageFormat>(value % 9); break;
+      case 2: image.widthStep = nudge(image.widthStep, value % 4); break;
+      case 3: image.width = value; break;
       default: break;
     }
-    if (image.width > image.widthStep && in_.ConsumeBool()) image.width = image.widthStep;
-    ExtraFrameData extra;
-    fillExtra(in_, extra, clock_);
+    if (change & 0x80) image.width = image.widthStep;  // the usual case: no row padding
     events_.frameWidth = image.width;
     events_.frameHeight = image.height;
-    std::string key = l->key;
-    if (in_.ConsumeIntegralInRange(0, 5) == 0) key.clear();
-    engine_->process(key, image, extra);
+    l->returned = true;
+    engine_->process(pickKey(l->key), image, extra);
   }
 
   void processSingle() {
     ClientFrame frame;
-    if (!makeFrame(in_, frame)) return;
+    const bool ok = makeFrame(in_, frame);
     ExtraFrameData extra;
     fillExtra(in_, extra, clock_);
+    const Reply reply = in_.reply();
+    if (!ok) return;
     settle();
-    transport_.answerEverything(true, pickReply(in_));
+    transport_.answerEverything(true, reply);
     engine_->processSingleImage(frame.image, extra);
     transport_.answerEverything(false, Reply());
   }
 
   void pushReply() {
+    const uint8_t which = in_.u8();
+    const Reply reply = in_.reply();
     const std::vector<std::string> ids = transport_.ids();
     std::string id;
-    switch (in_.ConsumeIntegralInRange(0, 5)) {
-      case 0: id = in_.ConsumeRandomLengthString(40); break;
-      case 1: if (!ids.empty()) id = ids.front(); break;
-      default: if (!ids.empty()) id = ids[ids.size() - 1 - in_.ConsumeIntegralInRange<size_t>(0, std::min<size_t>(ids.size() - 1, 3))]; break;
+    if (which % 8 == 0 || ids.empty()) {
+      id = "TovraStateEngine-" + std::to_string(which);
+    } else if (which % 8 == 1) {
+      id = ids.front();
+    } else {
+      id = ids[ids.size() - 1 - std::min<size_t>(ids.size() - 1, which % 4)];
     }
-    transport_.push(id, pickReply(in_));
+    transport_.push(id, reply);
   }
 
   // Gives the worker a moment to hand over a request that a frame just dispatched.
@@ -497,11 +600,13 @@ class Harness {
 
   // The delegates can be changed only while the engine is stopped.
   void configure() {
+    const uint8_t which = in_.u8();
+    const int32_t id = in_.i32();
     if (state_ != Tovra::STOPPED) return;
     settle();
-    switch (in_.ConsumeIntegralInRange(0, 3)) {
+    switch (which % 4) {
       case 0: engine_->addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, nullptr); break;
-      case 1: engine_->addObjectModule(static_cast<Tovra::ObjectModuleID>(in_.ConsumeIntegral<int32_t>()), nullptr); break;
+      case 1: engine_->addObjectModule(static_cast<Tovra::ObjectModuleID>(id), nullptr); break;
       case 2: engine_->setEventDelegate(nullptr); break;
       default: engine_->addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport_); break;
     }
@@ -510,7 +615,7 @@ class Harness {
     FUZZ_CHECK(req.minHeight == 320 && req.maxHeight == 720);
   }
 
-  FuzzedDataProvider& in_;
+  Reader& in_;
   Events events_;
   Transport transport_;
   std::unique_ptr<Tovra::TovraStateEngine> engine_;
@@ -523,8 +628,8 @@ class Harness {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-  FuzzedDataProvider in(data, size);
+  Reader in(data, size);
   Harness harness(in);
-  for (int i = 0; i < 48 && in.remaining_bytes() > 0; ++i) harness.step();
+  for (int i = 0; i < 64 && !in.done(); ++i) harness.step();
   return 0;
 }

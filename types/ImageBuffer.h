@@ -48,10 +48,13 @@ struct ImageBuffer {
   // Gives up owned memory: allocLen becomes 0, `data` keeps its (now stale) value.
   void releaseBuffer();
   // Copies min(length, allocLen) bytes from `source` into `data`; returns the count copied.
+  // A null `data` or source, a negative length, or a stale `data` copies nothing and returns 0.
   int32_t fillBuffer(const uint8_t* source, int32_t length);
   // Same as fillBuffer; the binding passes a direct byte buffer's memory.
   int32_t fillBufferWithByteBuffer(const uint8_t* source, int32_t length);
   // Two planes (luminance, then chroma) placed back to back; returns the total count copied.
+  // A null plane or a negative length contributes 0 bytes (the second plane then starts after
+  // whatever the first one really copied).
   int32_t fillBufferWithByteBuffer(const uint8_t* first, int32_t firstLength,
                                    const uint8_t* second, int32_t secondLength);
 

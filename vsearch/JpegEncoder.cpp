@@ -29,7 +29,7 @@
 // exceptions, while every other library error is reported as `false`.
 //
 // Memory the encoders need besides the caller's vectors (the semi-planar chroma work areas, the
-// scratch rows at the frame's bottom edge, the colour conversion row) comes from the library's
+// scratch rows at the picture's edges, the colour conversion row) comes from the library's
 // per-image pool, so it is released by jpeg_destroy_compress on the success and the error path
 // alike, and the library's own out-of-memory handling covers it.
 
@@ -172,7 +172,8 @@ bool needsScratch(const Plane& plane, size_t first, size_t count, size_t extent)
 }
 
 JSAMPLE* allocateImageBytes(j_compress_ptr cinfo, size_t size) {
-  return static_cast<JSAMPLE*>((*cinfo->mem->alloc_small)(reinterpret_cast<j_common_ptr>(cinfo), JPOOL_IMAGE, size));
+  return static_cast<JSAMPLE*>(
+      (*cinfo->mem->alloc_small)(reinterpret_cast<j_common_ptr>(cinfo), JPOOL_IMAGE, size));
 }
 
 bool compressYuv(const YuvFrame& frame, const Session& session) {
@@ -186,7 +187,7 @@ bool compressYuv(const YuvFrame& frame, const Session& session) {
     jpeg_destroy_compress(&cinfo);
     return false;
   }
-  jpeg_create_compress(&cinfo);
+  jpeg_create_compress(&cinfo);  // checks the library's own version and record size
   attachDestination(&cinfo, &dest, session);
 
   cinfo.image_width = static_cast<JDIMENSION>(frame.width);
@@ -259,10 +260,9 @@ bool compressYuv(const YuvFrame& frame, const Session& session) {
     const size_t next = cinfo.next_scanline;
     const size_t chromaFirst = next / 2;
 
-    if (lumaScratch == nullptr &&
-        (needsScratch(luma, next, 16, lumaExtent) ||
-         (!semiPlanar && (needsScratch(cbPlane, chromaFirst, 8, chromaExtent) ||
-                          needsScratch(crPlane, chromaFirst, 8, chromaExtent))))) {
+    if (lumaScratch == nullptr && (needsScratch(luma, next, 16, lumaExtent) ||
+                                   (!semiPlanar && (needsScratch(cbPlane, chromaFirst, 8, chromaExtent) ||
+                                                    needsScratch(crPlane, chromaFirst, 8, chromaExtent))))) {
       lumaScratch = allocateImageBytes(&cinfo, 16 * lumaExtent + 2 * 8 * chromaExtent);
       cbScratch = lumaScratch + 16 * lumaExtent;
       crScratch = cbScratch + 8 * chromaExtent;
@@ -281,7 +281,8 @@ bool compressYuv(const YuvFrame& frame, const Session& session) {
         // The frame always holds these pairs; the bound only guards the arithmetic.
         if (offset >= pairsLen) break;
         size_t count = chromaRowLen;
-        if (2 * static_cast<uint64_t>(count) > pairsLen - offset) count = static_cast<size_t>((pairsLen - offset) / 2);
+        if (2 * static_cast<uint64_t>(count) > pairsLen - offset)
+          count = static_cast<size_t>((pairsLen - offset) / 2);
         deinterleaveChroma(pairs + offset, count, cbFirst, cbRows[k], crRows[k]);
       }
     } else {
@@ -391,8 +392,8 @@ bool encodeYUVToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32
 }
 
 bool encodePackedToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32_t stride,
-                        int32_t numChannels, OrzaVSMobile::ImageFormat format,
-                        std::vector<uint8_t>& output, int32_t quality, std::vector<uint8_t>& work) {
+                        int32_t numChannels, OrzaVSMobile::ImageFormat format, std::vector<uint8_t>& output,
+                        int32_t quality, std::vector<uint8_t>& work) {
   work.resize(kWorkBufferSize);
   output.clear();
 

@@ -61,21 +61,6 @@ TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIds) {
   EXPECT_EQ(nullptr, pool.getNewSlot());
 }
 
-TEST(FrameRecordManagerTest, FreshRecordsAreZeroFilled) {
-  FrameRecordManager pool(1);
-  std::shared_ptr<FrameRecord> record = pool.getNewSlot();
-  ASSERT_NE(nullptr, record);
-  EXPECT_TRUE(record->pixels.empty());
-  EXPECT_EQ(0, record->height);
-  EXPECT_EQ(0, record->width);
-  EXPECT_EQ(0, record->numChannels);
-  EXPECT_EQ(0, record->widthStep);
-  EXPECT_EQ(0, record->format);
-  EXPECT_EQ(0, record->screenOrient);
-  EXPECT_EQ(0, record->flat);
-  EXPECT_EQ(0, record->sharpness);
-}
-
 TEST(FrameRecordManagerTest, RestartStopsAtTheFirstOutstandingRecord) {
   FrameRecordManager pool(5);
   std::vector<std::shared_ptr<FrameRecord>> held;

@@ -5,6 +5,7 @@
 #include <chrono>
 #include <memory>
 #include <thread>
+#include <type_traits>
 #include <vector>
 
 #include "support/StdoutCapture.h"
@@ -15,6 +16,9 @@ using orzavs_test::RunLog;
 using orzavs_test::StdoutCapture;
 using orzavs_test::TestJob;
 using Tovra::TovraExecutionEngine;
+
+static_assert(std::is_same<std::underlying_type<Tovra::JobState>::type, int32_t>::value,
+              "the job state is one 32-bit word");
 
 namespace {
 
@@ -201,12 +205,3 @@ TEST(TovraExecutionEngineTest, AJobMayAddJobsFromItsOwnRun) {
   EXPECT_EQ((std::vector<int>{1, 2}), log.ids());
 }
 
-TEST(TovraExecutionEngineTest, JobOwnerWaitsUntilSettled) {
-  TovraExecutionEngine engine(1);
-  TestJob job(1);
-  job.work = [](TestJob&) { std::this_thread::sleep_for(std::chrono::milliseconds(60)); };
-  engine.addJob(&job);
-  job.waitUntilSettled();
-  EXPECT_EQ(Tovra::Finished, job.state());
-  EXPECT_EQ(1, job.runs());
-}

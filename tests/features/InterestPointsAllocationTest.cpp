@@ -1,6 +1,7 @@
 // The interest-point step runs on every camera frame: once a thread has seen a frame of a given
 // size, further frames must not touch the heap. This binary counts operator new calls made on
-// the current thread (the replacement below serves every test of the binary, counting only).
+// the current thread (the replacement below, over malloc/free, serves every test of the
+// binary; it only counts).
 
 #include <gtest/gtest.h>
 
@@ -25,7 +26,14 @@ void* countedAllocate(std::size_t n) {
 
 void* operator new(std::size_t n) { return countedAllocate(n); }
 void* operator new[](std::size_t n) { return countedAllocate(n); }
+void* operator new(std::size_t n, const std::nothrow_t&) noexcept {
+  ++t_allocations;
+  return std::malloc(n == 0 ? 1 : n);
+}
+void* operator new[](std::size_t n, const std::nothrow_t& t) noexcept { return operator new(n, t); }
 void operator delete(void* p) noexcept { std::free(p); }
+void operator delete(void* p, const std::nothrow_t&) noexcept { std::free(p); }
+void operator delete[](void* p, const std::nothrow_t&) noexcept { std::free(p); }
 void operator delete[](void* p) noexcept { std::free(p); }
 void operator delete(void* p, std::size_t) noexcept { std::free(p); }
 void operator delete[](void* p, std::size_t) noexcept { std::free(p); }

@@ -1,15 +1,12 @@
 #ifndef ORZAVS_TESTS_SUPPORT_ENGINEFAKES_H
 #define ORZAVS_TESTS_SUPPORT_ENGINEFAKES_H
 
-// Test doubles for driving the engine as a client would: an event delegate that records every
-// callback, a transport that records every request and can answer from its own thread, frame
-// generators, and a JPEG header reader. Header-only.
+// Test doubles for driving the engine as a client would: an event delegate that records its
+// callbacks, a transport that records requests and answers from its own thread, frames.
 
-#include <csetjmp>
-#include <cstdint>
-#include <cstdio>
 #include <chrono>
 #include <condition_variable>
+#include <cstdint>
 #include <deque>
 #include <functional>
 #include <mutex>
@@ -17,20 +14,15 @@
 #include <thread>
 #include <vector>
 
-#include <jpeglib.h>
-
 #include "server/ServerDelegate.h"
-#include "server/ServerRequest.h"
-#include "server/ServerResponse.h"
 #include "types/EventDelegateBase.h"
-#include "types/ImageBuffer.h"
+#include "types/ImageFormat.h"
 
 namespace orzavs_test {
 
 using Clock = std::chrono::steady_clock;
 using Ms = std::chrono::milliseconds;
 
-// Polls `done` every millisecond until it holds or `timeout` passes.
 inline bool waitFor(const std::function<bool()>& done, Ms timeout = Ms(5000)) {
   const auto end = Clock::now() + timeout;
   while (!done()) {
@@ -40,25 +32,20 @@ inline bool waitFor(const std::function<bool()>& done, Ms timeout = Ms(5000)) {
   return true;
 }
 
-struct DecodeCall {
-  std::vector<Tovra::ObjectInfo> objects;
-  Tovra::ResultMetadata metadata;
-};
-
 struct ErrorCall {
   Tovra::ObjectModuleID module;
   Tovra::Server::ResponseStatus status;
   int32_t code;
 };
 
-// Records every callback it gets, from any thread.
+// Records callbacks from any thread; `decodeHook` runs first in didDecode.
 class RecordingEvents : public Tovra::EventDelegateBase {
  public:
-  void didDecode(const std::vector<Tovra::ObjectInfo>& objects,
-                 const Tovra::ResultMetadata& metadata) override {
+  void didDecode(const std::vector<Tovra::ObjectInfo>& objects, const Tovra::ResultMetadata& metadata) override {
     if (decodeHook) decodeHook();
     std::lock_guard<std::mutex> lock(mutex_);
-    decodes_.push_back(DecodeCall{objects, metadata});
+    decoded_.push_back(objects);
+    metadata_.push_back(metadata);
   }
   void didReceiveServerError(Tovra::ObjectModuleID module, Tovra::Server::ResponseStatus status,
                              int32_t code) override {
@@ -70,48 +57,39 @@ class RecordingEvents : public Tovra::EventDelegateBase {
     pointCounts_.push_back(points.size());
   }
 
-  std::vector<DecodeCall> decodes() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return decodes_;
-  }
-  std::vector<ErrorCall> errors() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return errors_;
-  }
-  std::vector<size_t> pointCounts() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return pointCounts_;
-  }
-  size_t replyCallbacks() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return decodes_.size() + errors_.size();
-  }
+  std::vector<std::vector<Tovra::ObjectInfo>> decoded() const { return locked(decoded_); }
+  std::vector<Tovra::ResultMetadata> metadata() const { return locked(metadata_); }
+  std::vector<ErrorCall> errors() const { return locked(errors_); }
+  std::vector<size_t> pointCounts() const { return locked(pointCounts_); }
+  size_t replyCallbacks() const { return decoded().size() + errors().size(); }
 
-  // Runs at the start of didDecode, before anything is recorded (for delaying a delivery).
   std::function<void()> decodeHook;
 
  private:
+  template <typename T>
+  T locked(const T& value) const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return value;
+  }
   mutable std::mutex mutex_;
-  std::vector<DecodeCall> decodes_;
+  std::vector<std::vector<Tovra::ObjectInfo>> decoded_;
+  std::vector<Tovra::ResultMetadata> metadata_;
   std::vector<ErrorCall> errors_;
   std::vector<size_t> pointCounts_;
 };
 
-// What the transport kept of one request (the request itself belongs to the sender).
+// What the transport kept of one request.
 struct SentRequest {
   std::string id;
-  Tovra::Server::ServerRequest::ParamMap params;
-  Tovra::Server::ServerRequest::ParamMap metadata;
+  Tovra::Server::ServerRequest::ParamMap params, metadata;
   std::vector<uint8_t> body;
-  bool hasHandler = false;
 };
 
-// A transport that records requests and, when given a responder, answers each one from its own
-// thread after the delay the responder chooses (or never, if it says so).
+// Records requests; with a responder, answers each from its own thread after the chosen delay
+// (or never, when the responder returns false).
 class FakeTransport : public Tovra::Server::ServerDelegate {
  public:
-  // Fills `reply` and `delay` for a request; false means the request is never answered.
-  using Responder = std::function<bool(const SentRequest&, Tovra::Server::ServerResponse& reply, Ms& delay)>;
+  using Responder = std::function<bool(const SentRequest&, Tovra::Server::ServerResponse&, Ms& delay)>;
 
   FakeTransport() : thread_([this] { loop(); }) {}
   ~FakeTransport() override {
@@ -127,31 +105,33 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     std::lock_guard<std::mutex> lock(mutex_);
     responder_ = std::move(responder);
   }
+  // Answers every request with a reply whose query id is the request id.
+  void answerEverything(Ms delay = Ms(0)) {
+    setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& r, Ms& d) {
+      r.responseStr = "{\"queryId\":\"" + sent.id +
+                      "\",\"quillmark\":{\"searchResult\":[{\"content\":\"c\",\"contentType\":\"PIDN\","
+                      "\"properties\":{}}],\"resultMetadata\":{\"finalAccumulation\":true}}}";
+      d = delay;
+      return true;
+    });
+  }
 
-  // Called synchronously inside sendServerRequestImpl, on the sender's thread.
+  // Runs synchronously inside sendServerRequestImpl, on the sender's thread.
   std::function<void(const Tovra::Server::ServerRequest&)> onSend;
 
   bool sendServerRequestImpl(const Tovra::Server::ServerRequest& request) override {
-    SentRequest copy;
-    copy.id = request.id;
-    copy.params = request.params;
-    copy.metadata = request.metadata;
-    if (request.data.data != nullptr && request.data.length > 0) {
-      copy.body.assign(request.data.data, request.data.data + request.data.length);
-    }
-    copy.hasHandler = request.responseHandler != nullptr;
+    SentRequest copy{request.id, request.params, request.metadata, {}};
+    if (request.data.data != nullptr) copy.body.assign(request.data.data, request.data.data + request.data.length);
     {
       std::lock_guard<std::mutex> lock(mutex_);
       sent_.push_back(copy);
-      if (responder_) {
-        Tovra::Server::ServerResponse reply;
-        reply.id = copy.id;
-        Ms delay(0);
-        if (responder_(copy, reply, delay)) {
-          queue_.push_back(Scheduled{reply, Clock::now() + delay});
-        } else {
-          ++dropped_;
-        }
+      Tovra::Server::ServerResponse reply;
+      reply.id = copy.id;
+      Ms delay(0);
+      if (responder_ && responder_(copy, reply, delay)) {
+        queue_.push_back({reply, Clock::now() + delay});
+      } else if (responder_) {
+        ++dropped_;
       }
     }
     wake_.notify_all();
@@ -159,11 +139,10 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     return true;
   }
 
-  // Queues a reply for the transport thread.
   void pushLater(const Tovra::Server::ServerResponse& reply, Ms delay = Ms(0)) {
     {
       std::lock_guard<std::mutex> lock(mutex_);
-      queue_.push_back(Scheduled{reply, Clock::now() + delay});
+      queue_.push_back({reply, Clock::now() + delay});
     }
     wake_.notify_all();
   }
@@ -172,10 +151,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     std::lock_guard<std::mutex> lock(mutex_);
     return sent_;
   }
-  size_t sentCount() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return sent_.size();
-  }
+  size_t sentCount() const { return sent().size(); }
   size_t pushedCount() const {
     std::lock_guard<std::mutex> lock(mutex_);
     return pushed_;
@@ -184,8 +160,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     std::lock_guard<std::mutex> lock(mutex_);
     return dropped_;
   }
-  // True once every queued reply has been pushed.
-  bool idle() const {
+  bool idle() const {  // every queued reply pushed
     std::lock_guard<std::mutex> lock(mutex_);
     return queue_.empty() && !pushing_;
   }
@@ -198,24 +173,21 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
 
   void loop() {
     std::unique_lock<std::mutex> lock(mutex_);
-    for (;;) {
-      if (stopping_) return;
+    while (!stopping_) {
       if (queue_.empty()) {
         wake_.wait(lock);
-        continue;
-      }
-      if (Clock::now() < queue_.front().due) {
+      } else if (Clock::now() < queue_.front().due) {
         wake_.wait_until(lock, queue_.front().due);
-        continue;
+      } else {
+        Scheduled next = queue_.front();
+        queue_.pop_front();
+        pushing_ = true;
+        lock.unlock();
+        pushServerResponse(next.reply);
+        lock.lock();
+        pushing_ = false;
+        ++pushed_;
       }
-      Scheduled next = queue_.front();
-      queue_.pop_front();
-      pushing_ = true;
-      lock.unlock();
-      pushServerResponse(next.reply);
-      lock.lock();
-      pushing_ = false;
-      ++pushed_;
     }
   }
 
@@ -228,110 +200,36 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   std::deque<Scheduled> queue_;
   size_t pushed_ = 0;
   size_t dropped_ = 0;
-  std::thread thread_;  // last: starts after every other member exists
+  std::thread thread_;  // last: starts once every other member exists
 };
 
-// A reply body the parser accepts, with one result of each given content type text.
-inline std::string replyBody(const std::string& queryId,
-                             const std::vector<std::string>& contentTypes = {"PIDN"}) {
+// A reply body with one result per content type text.
+inline std::string replyBody(const std::string& queryId, const std::vector<std::string>& types = {"PIDN"}) {
   std::string results;
-  for (size_t i = 0; i < contentTypes.size(); ++i) {
-    if (i > 0) results += ",";
-    results += "{\"content\":\"c" + std::to_string(i) + "\",\"contentType\":\"" + contentTypes[i] +
-               "\",\"properties\":{}}";
+  for (size_t i = 0; i < types.size(); ++i) {
+    results += (i ? "," : "") + std::string("{\"content\":\"c") + std::to_string(i) +
+               "\",\"contentType\":\"" + types[i] + "\",\"properties\":{}}";
   }
   return "{\"queryId\":\"" + queryId + "\",\"quillmark\":{\"searchResult\":[" + results +
          "],\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[]}}}";
 }
 
-// Deterministic pseudo-random bytes.
-inline uint32_t nextRandom(uint32_t& state) {
-  state = state * 1664525u + 1013904223u;
-  return state >> 8;
-}
-
-// A frame in the given layout whose first plane is sprinkled with isolated bright dots on a
-// dark background (plenty of corners, high sharpness) or, with `flat`, uniform grey (no corners,
-// sharpness 0). YUV frames get (stride * height * 3) / 2 bytes, others stride * height.
-inline std::vector<uint8_t> makeFrame(int width, int height, int stride, int format,
-                                      bool flat = false, uint32_t seed = 1) {
-  const bool yuv = OrzaVSMobile::isYUVFormat(format);
-  size_t size = static_cast<size_t>(stride) * height;
-  if (yuv) size = size * 3 / 2;
-  std::vector<uint8_t> bytes(size, flat ? 128 : 20);
+// A frame whose first plane has isolated bright dots on dark (many corners, sharpness > 0) or,
+// with `flat`, is uniform (no corners, sharpness 0). YUV frames get stride * height * 3 / 2
+// bytes, others stride * height.
+inline std::vector<uint8_t> makeFrame(int width, int height, int stride, int format, bool flat = false,
+                                      uint32_t seed = 1) {
+  const size_t plane = static_cast<size_t>(stride) * height;
+  std::vector<uint8_t> bytes(OrzaVSMobile::isYUVFormat(format) ? plane * 3 / 2 : plane, 128);
   if (!flat) {
-    uint32_t state = seed;
     for (int y = 0; y < height; ++y) {
       for (int x = 0; x < width; ++x) {
-        if (nextRandom(state) % 23 == 0) bytes[static_cast<size_t>(y) * stride + x] = 240;
+        seed = seed * 1664525u + 1013904223u;
+        bytes[static_cast<size_t>(y) * stride + x] = (seed >> 8) % 23 == 0 ? 240 : 20;
       }
     }
   }
-  if (yuv) {
-    for (size_t i = static_cast<size_t>(stride) * height; i < size; ++i) bytes[i] = 128;
-  }
   return bytes;
-}
-
-// Reads the size of a JPEG stream by decoding its header and all scan lines; false if the
-// stream is not a complete, decodable JPEG.
-struct JpegInfo {
-  int width = 0;
-  int height = 0;
-  int components = 0;
-};
-
-namespace detail {
-struct JpegError {
-  jpeg_error_mgr mgr;
-  std::jmp_buf jump;
-};
-inline void jpegErrorExit(j_common_ptr cinfo) {
-  std::longjmp(reinterpret_cast<JpegError*>(cinfo->err)->jump, 1);
-}
-inline void jpegSilence(j_common_ptr, int) {}
-}  // namespace detail
-
-// No object with a destructor lives in this frame: longjmp would skip it.
-inline bool decodeJpeg(const uint8_t* bytes, size_t length, JpegInfo* info, uint8_t* rowScratch,
-                       size_t scratchLen) {
-  jpeg_decompress_struct cinfo;
-  detail::JpegError error;
-  cinfo.err = jpeg_std_error(&error.mgr);
-  error.mgr.error_exit = detail::jpegErrorExit;
-  error.mgr.emit_message = detail::jpegSilence;
-  if (setjmp(error.jump)) {
-    jpeg_destroy_decompress(&cinfo);
-    return false;
-  }
-  jpeg_create_decompress(&cinfo);
-  jpeg_mem_src(&cinfo, const_cast<unsigned char*>(bytes), static_cast<unsigned long>(length));
-  if (jpeg_read_header(&cinfo, TRUE) != JPEG_HEADER_OK) {
-    jpeg_destroy_decompress(&cinfo);
-    return false;
-  }
-  jpeg_start_decompress(&cinfo);
-  const size_t rowLen = static_cast<size_t>(cinfo.output_width) * cinfo.output_components;
-  if (rowLen > scratchLen) {
-    jpeg_destroy_decompress(&cinfo);
-    return false;
-  }
-  while (cinfo.output_scanline < cinfo.output_height) {
-    JSAMPROW row = rowScratch;
-    jpeg_read_scanlines(&cinfo, &row, 1);
-  }
-  info->width = static_cast<int>(cinfo.image_width);
-  info->height = static_cast<int>(cinfo.image_height);
-  info->components = cinfo.num_components;
-  jpeg_finish_decompress(&cinfo);
-  jpeg_destroy_decompress(&cinfo);
-  return true;
-}
-
-inline bool decodeJpeg(const std::vector<uint8_t>& bytes, JpegInfo& info) {
-  if (bytes.empty()) return false;
-  std::vector<uint8_t> scratch(1 << 16);
-  return decodeJpeg(bytes.data(), bytes.size(), &info, scratch.data(), scratch.size());
 }
 
 }  // namespace orzavs_test

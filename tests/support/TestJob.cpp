@@ -53,14 +53,6 @@ void TestJob::finishUnlessAwaiting() {
 
 void TestJob::cancel() { state_.store(Tovra::Finished); }
 
-void TestJob::waitUntilSettled() {
-  for (;;) {
-    const int32_t s = state_.load();
-    if (s != Tovra::Queued && s != Tovra::Running) return;
-    std::this_thread::sleep_for(std::chrono::milliseconds(50));
-  }
-}
-
 bool TestJob::waitForState(int32_t wanted, std::chrono::milliseconds timeout) {
   const auto deadline = std::chrono::steady_clock::now() + timeout;
   while (state_.load() != wanted) {

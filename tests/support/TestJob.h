@@ -47,10 +47,8 @@ class TestJob : public Tovra::Job {
   void run() override;
   void finishUnlessAwaiting() override;
 
-  // The job's owner: cancel() settles it Finished; waitUntilSettled() polls (every 50 ms, as a
-  // real job does) while it is Queued or Running.
+  // The job's owner settles it Finished.
   void cancel();
-  void waitUntilSettled();
 
   // Polls every millisecond until the state is `wanted`; false after the timeout.
   bool waitForState(int32_t wanted, std::chrono::milliseconds timeout = std::chrono::seconds(10));

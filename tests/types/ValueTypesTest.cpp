@@ -77,20 +77,3 @@ TEST(FrameDataTest, DefaultsMeanNothingIsKnown) {
   EXPECT_EQ(0, requirement.maxHeight);
 }
 
-TEST(PointTest, ConstructorsSetTheFieldsInOrder) {
-  OrzaVSMobile::Point2f origin;
-  EXPECT_EQ(0.0f, origin.x);
-  EXPECT_EQ(0.0f, origin.y);
-  OrzaVSMobile::Point2f p(1.5f, -2.25f);
-  EXPECT_EQ(1.5f, p.x);
-  EXPECT_EQ(-2.25f, p.y);
-
-  OrzaVSMobile::Point3d zero;
-  EXPECT_EQ(0.0, zero.x);
-  EXPECT_EQ(0.0, zero.y);
-  EXPECT_EQ(0.0, zero.z);
-  OrzaVSMobile::Point3d q(1.0, 2.0, 3.0);
-  EXPECT_EQ(1.0, q.x);
-  EXPECT_EQ(2.0, q.y);
-  EXPECT_EQ(3.0, q.z);
-}

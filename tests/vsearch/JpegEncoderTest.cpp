@@ -56,9 +56,11 @@ std::vector<uint8_t> encodePacked(const std::vector<uint8_t>& frame, int width, 
 // ---------------------------------------------------------------------------------------------
 // Streams decode back to their input.
 
-// Thresholds are what baseline JPEG comfortably gives on smooth content (measured about 45 dB
-// luma and 43 dB chroma at quality 90, 36 dB luma at quality 50); a lost block, a swapped plane
-// or a misaddressed row drops them far below.
+// PSNR thresholds sit below what this content measures here (smooth frames: luma 53.8 dB,
+// chroma 50.3 dB at quality 90, luma 48.0 dB at quality 50; packed RGB 46.9 dB, grey 54.3 dB at
+// quality 90; the worst partial-band frame 48.8 dB; noise at quality 100: 32.1 dB through the
+// fast integer DCT, 58.5 dB grey through the library's default DCT). A lost block, a swapped
+// plane or a misaddressed row drops them far lower.
 TEST(JpegEncoder, YuvFramesDecodeCloseToTheirInput) {
   const Yuv420 img = smoothYuv(320, 240);
   for (ImageFormat format : kYuvFormats) {
@@ -79,13 +81,14 @@ TEST(JpegEncoder, YuvFramesDecodeCloseToTheirInput) {
     EXPECT_EQ(d.vSamp[2], 1);
     EXPECT_EQ(d.warnings, 0);
     EXPECT_EQ(d.bytesLeft, 0u);
-    EXPECT_GE(lumaPsnr(d, img), 40.0);
-    EXPECT_GE(chromaPsnr(d, img, 1), 38.0);
-    EXPECT_GE(chromaPsnr(d, img, 2), 38.0);
+    EXPECT_GE(lumaPsnr(d, img), 45.0);
+    EXPECT_GE(chromaPsnr(d, img, 1), 42.0);
+    EXPECT_GE(chromaPsnr(d, img, 2), 42.0);
   }
-  const Decoded q50 = decodeJpeg(encodeYuv(packYuv(img, OrzaVSMobile::NV21), 320, 240, OrzaVSMobile::NV21, 50));
+  const Decoded q50 =
+      decodeJpeg(encodeYuv(packYuv(img, OrzaVSMobile::NV21), 320, 240, OrzaVSMobile::NV21, 50));
   ASSERT_TRUE(q50.ok);
-  EXPECT_GE(lumaPsnr(q50, img), 32.0);
+  EXPECT_GE(lumaPsnr(q50, img), 40.0);
 }
 
 TEST(JpegEncoder, PackedFramesDecodeCloseToTheirInput) {
@@ -106,18 +109,21 @@ TEST(JpegEncoder, PackedFramesDecodeCloseToTheirInput) {
     ImageFormat format;
     int channels;
     const std::vector<uint8_t>* pixels;
-  } cases[] = {{OrzaVSMobile::RGB, 3, &rgb}, {OrzaVSMobile::BGR, 3, &bgr}, {OrzaVSMobile::BGRA, 4, &bgra},
+  } cases[] = {{OrzaVSMobile::RGB, 3, &rgb},
+               {OrzaVSMobile::BGR, 3, &bgr},
+               {OrzaVSMobile::BGRA, 4, &bgra},
                {OrzaVSMobile::BGRX, 4, &bgra}};
   for (const Case& c : cases) {
     SCOPED_TRACE(name(c.format));
-    const Decoded d = decodeJpeg(encodePacked(*c.pixels, w, h, w * c.channels, c.channels, c.format), JCS_RGB);
+    const Decoded d =
+        decodeJpeg(encodePacked(*c.pixels, w, h, w * c.channels, c.channels, c.format), JCS_RGB);
     ASSERT_TRUE(d.ok);
     EXPECT_EQ(d.jpegColorSpace, JCS_YCbCr);
     EXPECT_EQ(d.components, 3);
     EXPECT_FALSE(d.progressive);
     EXPECT_EQ(d.warnings, 0);
-    // Decoded R, G, B against the RGB picture; colour subsampling costs a few dB.
-    EXPECT_GE(psnr(rgb.size(), [&](size_t i) { return d.pixels[i]; }, [&](size_t i) { return rgb[i]; }), 33.0);
+    // Decoded R, G, B against the RGB picture.
+    EXPECT_GE(bytePsnr(d.pixels, rgb), 40.0);
   }
 
   const std::vector<uint8_t> grey = smoothPacked(w, h, 1, w);
@@ -125,7 +131,7 @@ TEST(JpegEncoder, PackedFramesDecodeCloseToTheirInput) {
   ASSERT_TRUE(g.ok);
   EXPECT_EQ(g.jpegColorSpace, JCS_GRAYSCALE);
   EXPECT_EQ(g.components, 1);
-  EXPECT_GE(psnr(grey.size(), [&](size_t i) { return g.pixels[i]; }, [&](size_t i) { return grey[i]; }), 40.0);
+  EXPECT_GE(bytePsnr(g.pixels, grey), 45.0);
 }
 
 // Every full work buffer and then the tail reach the output, in order: a stream many times the
@@ -145,7 +151,6 @@ TEST(JpegEncoder, LongStreamsArriveWhole) {
   ASSERT_TRUE(d.ok);
   EXPECT_EQ(d.warnings, 0);
   EXPECT_EQ(d.bytesLeft, 0u);
-  // Pure noise at quality 100 with the fast integer DCT measures about 32 dB.
   EXPECT_GE(lumaPsnr(d, img), 30.0);
 
   // Reusing both vectors for the next frame starts the output afresh.
@@ -164,7 +169,7 @@ TEST(JpegEncoder, LongStreamsArriveWhole) {
   ASSERT_TRUE(g.ok);
   EXPECT_EQ(g.warnings, 0);
   EXPECT_EQ(g.bytesLeft, 0u);
-  EXPECT_GE(psnr(grey.size(), [&](size_t i) { return g.pixels[i]; }, [&](size_t i) { return grey[i]; }), 40.0);
+  EXPECT_GE(bytePsnr(g.pixels, grey), 50.0);
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -193,7 +198,8 @@ TEST(JpegEncoder, PlanarAndSemiPlanarFramesOfOneImageAreIdentical) {
   // Width and height multiples of 16: both layouts then hand the library the same samples.
   for (const auto& s : {std::make_pair(64, 48), std::make_pair(320, 240)}) {
     const Yuv420 img = smoothYuv(s.first, s.second);
-    const std::vector<uint8_t> i420 = encodeYuv(packYuv(img, OrzaVSMobile::I420), s.first, s.second, OrzaVSMobile::I420);
+    const std::vector<uint8_t> i420 =
+        encodeYuv(packYuv(img, OrzaVSMobile::I420), s.first, s.second, OrzaVSMobile::I420);
     EXPECT_EQ(i420, encodeYuv(packYuv(img, OrzaVSMobile::NV12), s.first, s.second, OrzaVSMobile::NV12));
     EXPECT_EQ(i420, encodeYuv(packYuv(img, OrzaVSMobile::NV21), s.first, s.second, OrzaVSMobile::NV21));
   }
@@ -215,7 +221,8 @@ TEST(JpegEncoder, PaddedPackedRowsEncodeLikeTightRows) {
   struct Case {
     ImageFormat format;
     int channels;
-  } cases[] = {{OrzaVSMobile::RGB, 3}, {OrzaVSMobile::BGR, 3}, {OrzaVSMobile::BGRA, 4}, {OrzaVSMobile::GRAY, 1}};
+  } cases[] = {
+      {OrzaVSMobile::RGB, 3}, {OrzaVSMobile::BGR, 3}, {OrzaVSMobile::BGRA, 4}, {OrzaVSMobile::GRAY, 1}};
   for (const Case& c : cases) {
     SCOPED_TRACE(name(c.format));
     const size_t row = static_cast<size_t>(w) * c.channels;
@@ -246,7 +253,8 @@ TEST(JpegEncoder, BgrOrdersAreConvertedToRgbAndAlphaIsDropped) {
   EXPECT_NE(expected, encodePacked(rgb, w, h, 3 * w, 3, OrzaVSMobile::BGR));
   // One channel is grey whatever the format says.
   const std::vector<uint8_t> grey(rgb.begin(), rgb.begin() + w * h);
-  EXPECT_EQ(encodePacked(grey, w, h, w, 1, OrzaVSMobile::GRAY), encodePacked(grey, w, h, w, 1, OrzaVSMobile::RGB));
+  EXPECT_EQ(encodePacked(grey, w, h, w, 1, OrzaVSMobile::GRAY),
+            encodePacked(grey, w, h, w, 1, OrzaVSMobile::RGB));
 }
 
 TEST(JpegEncoder, QualityIsClampedAndTablesStayBaseline) {
@@ -281,7 +289,8 @@ TEST(JpegEncoder, QualityIsClampedAndTablesStayBaseline) {
 
 TEST(JpegEncoder, TinyFramesEncode) {
   for (ImageFormat format : kYuvFormats) {
-    for (const auto& s : {std::make_pair(1, 1), std::make_pair(2, 1), std::make_pair(1, 2), std::make_pair(3, 3)}) {
+    for (const auto& s :
+         {std::make_pair(1, 1), std::make_pair(2, 1), std::make_pair(1, 2), std::make_pair(3, 3)}) {
       SCOPED_TRACE(name(format) + " " + std::to_string(s.first) + "x" + std::to_string(s.second));
       const Yuv420 img = smoothYuv(s.first, s.second);
       const Decoded d = decodeJpeg(encodeYuv(packYuv(img, format), s.first, s.second, format));
@@ -312,7 +321,7 @@ TEST(JpegEncoder, PartialBandsAndColumnsStayInsideTheFrame) {
       EXPECT_EQ(d.width, w);
       EXPECT_EQ(d.height, h);
       EXPECT_EQ(d.warnings, 0);
-      EXPECT_GE(lumaPsnr(d, img), 35.0);
+      EXPECT_GE(lumaPsnr(d, img), 42.0);
     }
   }
   const int packedSizes[][2] = {{1, 17}, {3, 5}, {5, 33}, {17, 9}, {31, 2}};
@@ -321,8 +330,9 @@ TEST(JpegEncoder, PartialBandsAndColumnsStayInsideTheFrame) {
       const int w = s[0], h = s[1];
       SCOPED_TRACE(std::to_string(channels) + " channels " + std::to_string(w) + "x" + std::to_string(h));
       const std::vector<uint8_t> px = smoothPacked(w, h, channels, w * channels);
-      const ImageFormat format = channels == 1 ? OrzaVSMobile::GRAY : channels == 3 ? OrzaVSMobile::RGB
-                                                                                    : OrzaVSMobile::BGRA;
+      const ImageFormat format = channels == 1   ? OrzaVSMobile::GRAY
+                                 : channels == 3 ? OrzaVSMobile::RGB
+                                                 : OrzaVSMobile::BGRA;
       const Decoded d = decodeJpeg(encodePacked(px, w, h, w * channels, channels, format));
       ASSERT_TRUE(d.ok);
       EXPECT_EQ(d.width, w);
@@ -353,7 +363,8 @@ TEST(JpegEncoder, BytesAfterTheFrameDoNotMatter) {
 // the picture's own rows and columns: there the encoder must give exactly its bytes. Heights 40
 // and 72 make the library complete the last chroma block row from the work rows the previous
 // band left behind.
-std::vector<uint8_t> referenceEncode(const std::vector<uint8_t>& frame, int w, int h, ImageFormat format, int quality) {
+std::vector<uint8_t> referenceEncode(const std::vector<uint8_t>& frame, int w, int h, ImageFormat format,
+                                     int quality) {
   jpeg_compress_struct c;
   jpeg_error_mgr e;
   c.err = jpeg_std_error(&e);
@@ -452,13 +463,15 @@ TEST(JpegEncoder, MatchesThePlainBandAddressingWhereItStaysInsideTheFrame) {
   struct Case {
     ImageFormat format;
     int w, h, quality;
-  } cases[] = {{OrzaVSMobile::I420, 64, 48, 50},  {OrzaVSMobile::I420, 320, 240, 90}, {OrzaVSMobile::NV21, 64, 40, 50},
-               {OrzaVSMobile::NV12, 64, 40, 75},  {OrzaVSMobile::NV21, 96, 72, 50},  {OrzaVSMobile::NV21, 256, 192, 100}};
+  } cases[] = {{OrzaVSMobile::I420, 64, 48, 50}, {OrzaVSMobile::I420, 320, 240, 90},
+               {OrzaVSMobile::NV21, 64, 40, 50}, {OrzaVSMobile::NV12, 64, 40, 75},
+               {OrzaVSMobile::NV21, 96, 72, 50}, {OrzaVSMobile::NV21, 256, 192, 100}};
   for (const Case& c : cases) {
     SCOPED_TRACE(name(c.format) + " " + std::to_string(c.w) + "x" + std::to_string(c.h));
     const Yuv420 img = c.w == 256 ? noiseYuv(c.w, c.h, 11) : smoothYuv(c.w, c.h);  // noise: many flushes
     const std::vector<uint8_t> frame = packYuv(img, c.format);
-    EXPECT_EQ(encodeYuv(frame, c.w, c.h, c.format, c.quality), referenceEncode(frame, c.w, c.h, c.format, c.quality));
+    EXPECT_EQ(encodeYuv(frame, c.w, c.h, c.format, c.quality),
+              referenceEncode(frame, c.w, c.h, c.format, c.quality));
   }
 }
 
@@ -540,9 +553,11 @@ TEST(JpegEncoder, LibraryErrorsBecomeFalse) {
     GuardedBytes wide(static_cast<size_t>(70000) * 4);
     std::memset(wide.data(), 0x80, wide.size());
     bool ok = true;
-    EXPECT_NO_THROW(ok = encodePackedToJpeg(wide.data(), 1, 70000, 70000 * 4, 4, OrzaVSMobile::BGRA, out, 50, work));
+    EXPECT_NO_THROW(
+        ok = encodePackedToJpeg(wide.data(), 1, 70000, 70000 * 4, 4, OrzaVSMobile::BGRA, out, 50, work));
     EXPECT_FALSE(ok);
-    EXPECT_NO_THROW(ok = encodePackedToJpeg(wide.data(), 1, 70000, 70000, 1, OrzaVSMobile::GRAY, out, 50, work));
+    EXPECT_NO_THROW(
+        ok = encodePackedToJpeg(wide.data(), 1, 70000, 70000, 1, OrzaVSMobile::GRAY, out, 50, work));
     EXPECT_FALSE(ok);
   }
   EXPECT_EQ(capture.text(), "");

@@ -1,7 +1,7 @@
 // Native helpers for the Java tests of the binding: they call delegates the way the engine does,
 // from a native thread that the Java VM does not know, and report what the thread's attachment
 // looked like before and after. This library uses only the JNI function table and virtual calls
-// on the handles Java passes, so it needs nothing from libOrzaVSMobile at link time.
+// on the handles Java passes; it needs nothing from libOrzaVSMobile at link time.
 
 #include <jni.h>
 

@@ -66,7 +66,7 @@ public final class FileSources {
 
     ImageFolder(List<File> files, double fps, int repeat, String description) {
       this.files = files;
-      this.fps = fps > 0 ? fps : 5; // stills: slow enough that each can be analysed
+      this.fps = fps > 0 ? fps : 5; // time stamps 0.2 s apart: the engine takes every image
       this.repeat = Math.max(1, repeat);
       this.description = description;
     }
@@ -97,6 +97,11 @@ public final class FileSources {
     @Override
     public int expectedFrames() {
       return files.size() * repeat;
+    }
+
+    @Override
+    public boolean stills() {
+      return true;
     }
 
     @Override
@@ -150,8 +155,11 @@ public final class FileSources {
         if (w <= 0 || h <= 0) throw new IOException(file + ": header lacks W and H");
         if ((w & 1) != 0 || (h & 1) != 0) throw new IOException(file + ": odd frame size " + w + "x" + h + " is not supported");
         if ((long) w * h > MAX_PIXELS) throw new IOException(file + ": frame size " + w + "x" + h + " too large");
-        if (!colour.startsWith("420") && !colour.equals("mono")) {
-          throw new IOException(file + ": colour space C" + colour + " is not supported (use 4:2:0 or mono)");
+        // 8-bit 4:2:0 (any chroma siting) or 8-bit grey; deeper samples (C420p10, Cmono16) or
+        // other subsamplings would be misread, so they are refused.
+        if (!colour.equals("420") && !colour.equals("420jpeg") && !colour.equals("420paldv")
+            && !colour.equals("420mpeg2") && !colour.equals("mono")) {
+          throw new IOException(file + ": colour space C" + colour + " is not supported (use 8-bit 4:2:0 or mono)");
         }
         this.width = w;
         this.height = h;

@@ -19,6 +19,14 @@ public interface FrameSource extends Closeable {
     return -1;
   }
 
+  /**
+   * True for still images: each deserves its own query, so the scan waits for the outcome of a
+   * frame's request before it feeds the next frame.
+   */
+  default boolean stills() {
+    return false;
+  }
+
   @Override
   default void close() throws IOException {}
 }

@@ -319,7 +319,7 @@ public final class ReportWriter {
     tile(b, String.valueOf(s.errors + s.unanswered), "errors / unanswered", s.errors + s.unanswered > 0 ? "bad" : "");
     tile(b, s.results + " (" + s.boxes + " boxes)", "results");
     tile(b, Double.isNaN(s.p50Ms) ? "-" : String.format(Locale.ROOT, "%.0f / %.0f / %.0f ms", s.p50Ms, s.p90Ms, s.maxMs),
-        "latency p50 / p90 / max");
+        "latency p50 / p90 / max", "wide");
     b.append("</section>\n");
 
     b.append("<section><h2>Timeline</h2>\n").append(timeline(frames, requests)).append("\n");
@@ -414,7 +414,7 @@ public final class ReportWriter {
       ".facts dt{font-weight:600}.facts dd{margin:0;color:var(--ink);word-break:break-all}",
       ".tiles{display:grid;grid-template-columns:repeat(auto-fill,minmax(170px,1fr));gap:10px;margin-top:18px}",
       ".tile{background:#fff;border:1px solid var(--line);border-radius:8px;padding:10px 12px}",
-      ".tile .v{font-size:20px;font-weight:650}.tile .l{color:var(--muted);font-size:12px}.tile.bad .v{color:var(--err)}",
+      ".tile.wide{grid-column:span 2}.tile .v{font-size:20px;font-weight:650}.tile .l{color:var(--muted);font-size:12px}.tile.bad .v{color:var(--err)}",
       ".timeline{width:100%;height:auto;background:#fff;border:1px solid var(--line);border-radius:8px}",
       ".timeline .pts{fill:var(--pts);opacity:.75}.timeline .base{stroke:#b8c0cc}.timeline .tick{stroke:#eef1f5}",
       ".timeline .ax{font-size:11px;fill:var(--muted)}",

@@ -48,7 +48,7 @@ public final class VsScan {
         "usage: vsscan [SOURCE] [options]",
         "",
         "SOURCE (none: a built-in scene, a textured card moving over a background)",
-        "  DIR               PNG/JPEG images in name order (converted to NV21)",
+        "  DIR               PNG/JPEG images in name order (converted to NV21), one query each",
         "  FILE.png|.jpg     one image",
         "  FILE.y4m          a YUV4MPEG2 video, 4:2:0 or mono (fed as I420)",
         "  FILE              a raw NV21 stream, frames back to back (needs --size)",
@@ -216,9 +216,10 @@ public final class VsScan {
         int n = 0;
         while (n < limit && (f = source.next()) != null) {
           double t = n / fps;
-          if (o.pace) sleepUntil(startNanos + (long) (t * 1e9));
+          if (o.pace && !source.stills()) sleepUntil(startNanos + (long) (t * 1e9));
           engine.feed(f, t, o.orientation);
           n++;
+          if (source.stills()) engine.awaitOutcomes(o.connectTimeoutMs + o.readTimeoutMs + 2000L);
           Summary now = null;
           if (progress.due()) now = new Summary(log);
           if (now != null) progress.update(n, total, now);

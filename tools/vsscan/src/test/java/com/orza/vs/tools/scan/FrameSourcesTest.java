@@ -118,7 +118,7 @@ class FrameSourcesTest {
       s.next();
       assertThrows(EOFException.class, s::next);
     }
-    String[] badHeaders = {"NOTY4M W4 H2", "YUV4MPEG2 H2", "YUV4MPEG2 W4 H2 C444", "YUV4MPEG2 W4 H2 It", "YUV4MPEG2 W3 H2",
+    String[] badHeaders = {"NOTY4M W4 H2", "YUV4MPEG2 H2", "YUV4MPEG2 W4 H2 C444", "YUV4MPEG2 W4 H2 C420p10", "YUV4MPEG2 W4 H2 Cmono16", "YUV4MPEG2 W4 H2 It", "YUV4MPEG2 W3 H2",
         "YUV4MPEG2 Wx H2", "YUV4MPEG2 W100000 H100000"};
     for (String h : badHeaders) {
       File f = y4m(h);

@@ -87,8 +87,26 @@ public final class ReferenceServer implements AutoCloseable {
     });
     http.setExecutor(executor);
     http.createContext("/", this::handle);
+    warmUp();
     http.start();
     return this;
+  }
+
+  /**
+   * Decodes and analyses one small frame, so that the first real request does not pay for
+   * loading the image decoder and compiling the analysis.
+   */
+  private static void warmUp() {
+    try {
+      BufferedImage img = new BufferedImage(64, 48, BufferedImage.TYPE_INT_RGB);
+      for (int i = 0; i < 64 * 48; i++) img.setRGB(i % 64, i / 64, (i * 2654435761L & 1) == 0 ? 0 : 0xffffff);
+      ByteArrayOutputStream out = new ByteArrayOutputStream();
+      ImageIO.write(img, "jpg", out);
+      BufferedImage back = decode(out.toByteArray());
+      if (back != null) TextureRegionFinder.analyse(back);
+    } catch (IOException | RuntimeException e) {
+      // Only a warm-up: the first request will show any real problem.
+    }
   }
 
   /** The bound port (after {@link #start()}). */
@@ -347,7 +365,7 @@ public final class ReferenceServer implements AutoCloseable {
     doc.put("queryId", q.queryId);
     doc.put("quillmark", quillmark);
 
-    String note = String.format(Locale.ROOT, "%s session %d (%d/%d%s) %dx%d, %.1f KB JPEG, rotation %s: %s",
+    String note = String.format(Locale.ROOT, "%s session %d (%d/%d%s) %dx%d, %.1f KB image, rotation %s: %s",
         q.queryId, q.session, q.accumulated.size(), Math.max(1, options.accumulate), q.isFinal ? ", final" : "",
         r.frameWidth, r.frameHeight, jpeg.length / 1024.0, rotation, measured);
     return new Answer(200, "application/json", Json.write(doc), note);

@@ -7,7 +7,7 @@ namespace Tovra {
 TovraStateEngineFacade::TovraStateEngineFacade(EventDelegateBase* eventDelegate)
     : eventDelegate_(eventDelegate) {
   engine_ = new TovraStateEngine();
-  engine_->setEventDelegate(eventDelegate);
+  engine_->setEventDelegate(eventDelegate_);
 }
 
 TovraStateEngineFacade::~TovraStateEngineFacade() {

@@ -1,7 +1,6 @@
 #include "features/Fast9.h"
 
 #include <algorithm>
-#include <climits>
 #include <cstdint>
 
 #include "features/Fast9Kernels.h"
@@ -16,8 +15,8 @@ namespace {
 // small enough that every byte offset fits in ptrdiff_t. Anything else has no corners.
 bool usablePlane(const uint8_t* plane, int width, int height, int stride) {
   if (plane == nullptr || width < 7 || height < 7 || stride < width) return false;
-  const long double span = static_cast<long double>(height - 1) * stride + width;
-  return span < static_cast<long double>(PTRDIFF_MAX);
+  const int64_t span = static_cast<int64_t>(height - 1) * stride + width;  // < 2^62
+  return static_cast<uint64_t>(span) <= static_cast<uint64_t>(PTRDIFF_MAX);
 }
 
 const RowKernels& pickKernels(Fast9Path path) {

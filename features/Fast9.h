@@ -21,9 +21,12 @@
 //
 // Every entry point accepts any geometry: a null plane, a width or height below 7, or a stride
 // below the width gives no corners, and nothing outside rows 0..height-1, columns
-// 0..width-1 of the plane is ever read. Thresholds of 255 and above give no corners (no
-// 8-bit difference can exceed them); negative thresholds are honoured exactly by the scalar
-// kernel.
+// 0..width-1 of the plane is ever read (the last row needs no padding). Thresholds of 255 and
+// above give no corners (no 8-bit difference can exceed them); negative thresholds are
+// honoured exactly, by a slower per-pixel path.
+//
+// Threads: every function may run on several threads at once; each thread keeps a few rows of
+// scratch memory for the detector.
 
 #include <cstddef>
 #include <cstdint>

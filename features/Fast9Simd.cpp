@@ -23,6 +23,7 @@ namespace fast9detail {
 #if defined(__SSE2__) || defined(ORZAVS_FAST9_NEON)
 namespace {
 
+// The few 16 x u8 operations the kernels need. Masks are vectors with all-ones or zero lanes.
 #if defined(__SSE2__)
 struct VecOps {
   using V = __m128i;
@@ -30,21 +31,21 @@ struct VecOps {
   static void store(uint8_t* p, V v) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), v); }
   static V splat(uint8_t v) { return _mm_set1_epi8(static_cast<char>(v)); }
   static V subs(V a, V b) { return _mm_subs_epu8(a, b); }
+  static V adds(V a, V b) { return _mm_adds_epu8(a, b); }
   static V vmin(V a, V b) { return _mm_min_epu8(a, b); }
   static V vmax(V a, V b) { return _mm_max_epu8(a, b); }
   static V vor(V a, V b) { return _mm_or_si128(a, b); }
-  static V adds(V a, V b) { return _mm_adds_epu8(a, b); }
   static bool anyNonZero(V a) { return _mm_movemask_epi8(_mm_cmpeq_epi8(a, _mm_setzero_si128())) != 0xFFFF; }
-  static V vand(V a, V b) { return _mm_and_si128(a, b); }
-  // All-ones in the lanes where a > t (unsigned), zero elsewhere.
-  static V greaterLanes(V a, V t) {
+  // Mask of the lanes where a > t (unsigned).
+  static V greater(V a, V t) {
     return _mm_xor_si128(_mm_cmpeq_epi8(_mm_subs_epu8(a, t), _mm_setzero_si128()), _mm_set1_epi8(-1));
   }
-  // Bit i set when lane i of a is greater than the same lane of t (unsigned).
-  static unsigned greaterMask(V a, V t) {
-    const V over = _mm_subs_epu8(a, t);
-    return ~static_cast<unsigned>(_mm_movemask_epi8(_mm_cmpeq_epi8(over, _mm_setzero_si128()))) & 0xFFFFu;
+  // a where a > t, else 0.
+  static V keepGreater(V a, V t) {
+    return _mm_andnot_si128(_mm_cmpeq_epi8(_mm_subs_epu8(a, t), _mm_setzero_si128()), a);
   }
+  // Bit i set for each set lane i of a mask.
+  static unsigned laneBits(V mask) { return static_cast<unsigned>(_mm_movemask_epi8(mask)); }
   static constexpr const char* kName = "SSE2";
 };
 #else
@@ -54,25 +55,22 @@ struct VecOps {
   static void store(uint8_t* p, V v) { vst1q_u8(p, v); }
   static V splat(uint8_t v) { return vdupq_n_u8(v); }
   static V subs(V a, V b) { return vqsubq_u8(a, b); }
+  static V adds(V a, V b) { return vqaddq_u8(a, b); }
   static V vmin(V a, V b) { return vminq_u8(a, b); }
   static V vmax(V a, V b) { return vmaxq_u8(a, b); }
   static V vor(V a, V b) { return vorrq_u8(a, b); }
-  static V adds(V a, V b) { return vqaddq_u8(a, b); }
   static bool anyNonZero(V a) {
     const uint8x8_t folded = vorr_u8(vget_low_u8(a), vget_high_u8(a));
     return vget_lane_u64(vreinterpret_u64_u8(folded), 0) != 0;
   }
-  static V vand(V a, V b) { return vandq_u8(a, b); }
-  static V greaterLanes(V a, V t) { return vcgtq_u8(a, t); }
-  static unsigned greaterMask(V a, V t) {
-    const uint8x16_t gt = vcgtq_u8(a, t);
-    const uint8x8_t any8 = vorr_u8(vget_low_u8(gt), vget_high_u8(gt));
-    if (vget_lane_u64(vreinterpret_u64_u8(any8), 0) == 0) return 0;  // common case: no lane
+  static V greater(V a, V t) { return vcgtq_u8(a, t); }
+  static V keepGreater(V a, V t) { return vandq_u8(a, vcgtq_u8(a, t)); }
+  static unsigned laneBits(V mask) {
     static const uint8_t kBits[16] = {1, 2, 4, 8, 16, 32, 64, 128, 1, 2, 4, 8, 16, 32, 64, 128};
-    const uint8x16_t bits = vandq_u8(gt, vld1q_u8(kBits));
-    uint8x8_t sum = vpadd_u8(vget_low_u8(bits), vget_high_u8(bits));  // 8 pairs
+    const uint8x16_t bits = vandq_u8(mask, vld1q_u8(kBits));
+    uint8x8_t sum = vpadd_u8(vget_low_u8(bits), vget_high_u8(bits));
     sum = vpadd_u8(sum, sum);
-    sum = vpadd_u8(sum, sum);  // lane 0: low byte mask, lane 1: high byte mask
+    sum = vpadd_u8(sum, sum);  // lane 0: bits of lanes 0-7, lane 1: bits of lanes 8-15
     return static_cast<unsigned>(vget_lane_u8(sum, 0)) | (static_cast<unsigned>(vget_lane_u8(sum, 1)) << 8);
   }
   static constexpr const char* kName = "NEON";
@@ -127,17 +125,17 @@ struct RowPointers {
 };
 
 // The rest of the test for the 16 centres at x, once positions 0 and 8 let some lane through:
-// positions 0, 4, 8, 12, then the whole circle. Stores the block's score bytes; returns the
-// corner lanes.
-inline unsigned finishBlock(const RowPointers& r, int x, V thr, V c, V p0, V p8, uint8_t* score) {
+// positions 0, 4, 8, 12, then the whole circle. Stores the block's score bytes and returns
+// them (non-zero exactly in the corner lanes).
+inline V finishBlock(const RowPointers& r, int x, V thr, V c, V p0, V p8, uint8_t* score) {
   const V p4 = VecOps::load(r.r0 + x + 3), p12 = VecOps::load(r.r0 + x - 3);
   const V bq = VecOps::vmin(VecOps::vmax(VecOps::subs(p0, c), VecOps::subs(p8, c)),
                             VecOps::vmax(VecOps::subs(p4, c), VecOps::subs(p12, c)));
   const V dq = VecOps::vmin(VecOps::vmax(VecOps::subs(c, p0), VecOps::subs(c, p8)),
                             VecOps::vmax(VecOps::subs(c, p4), VecOps::subs(c, p12)));
-  if (VecOps::greaterMask(VecOps::vmax(bq, dq), thr) == 0) {
+  if (!VecOps::anyNonZero(VecOps::subs(VecOps::vmax(bq, dq), thr))) {
     VecOps::store(score + x, VecOps::splat(0));
-    return 0;
+    return VecOps::splat(0);
   }
   const V p[16] = {p0,
                    VecOps::load(r.rp3 + x + 1),
@@ -163,8 +161,9 @@ inline unsigned finishBlock(const RowPointers& r, int x, V thr, V c, V p0, V p8,
   for (int k = 0; k < 16; ++k) m[k] = VecOps::subs(c, p[k]);
   const V best = VecOps::vmax(bright, maxArcMin(m));
   // Corner lanes keep best (= score + 1 >= b + 1), the others become 0.
-  VecOps::store(score + x, VecOps::vand(best, VecOps::greaterLanes(best, thr)));
-  return VecOps::greaterMask(best, thr);
+  const V kept = VecOps::keepGreater(best, thr);
+  VecOps::store(score + x, kept);
+  return kept;
 }
 
 int detectRow(const uint8_t* row, ptrdiff_t s, int width, int b, uint8_t* score, int32_t* xs) {
@@ -175,11 +174,14 @@ int detectRow(const uint8_t* row, ptrdiff_t s, int width, int b, uint8_t* score,
   const V zero = VecOps::splat(0);
   const int xEnd = width - 3;  // centres are 3 <= x < xEnd
   int n = 0;
-  auto emit = [&](int x, unsigned mask) {
+  // Records the corners of a block from its score bytes; `lanes` leaves out lanes that an
+  // earlier block already covered.
+  auto emit = [&](int x, V scores, unsigned lanes) {
     if (xs == nullptr) {
-      n |= static_cast<int>(mask);
+      n |= static_cast<int>(VecOps::anyNonZero(scores));
       return;
     }
+    unsigned mask = VecOps::laneBits(VecOps::greater(scores, zero)) & lanes;
     for (; mask != 0; mask &= mask - 1) xs[n++] = x + __builtin_ctz(mask);
   };
   int x = 3;
@@ -197,12 +199,12 @@ int detectRow(const uint8_t* row, ptrdiff_t s, int width, int b, uint8_t* score,
       continue;
     }
     if (VecOps::anyNonZero(far0)) {
-      emit(x, finishBlock(r, x, thr, c0, a0, b0, score));
+      emit(x, finishBlock(r, x, thr, c0, a0, b0, score), 0xFFFFu);
     } else {
       VecOps::store(score + x, zero);
     }
     if (VecOps::anyNonZero(far1)) {
-      emit(x + 16, finishBlock(r, x + 16, thr, c1, a1, b1, score));
+      emit(x + 16, finishBlock(r, x + 16, thr, c1, a1, b1, score), 0xFFFFu);
     } else {
       VecOps::store(score + x + 16, zero);
     }
@@ -220,24 +222,22 @@ int detectRow(const uint8_t* row, ptrdiff_t s, int width, int b, uint8_t* score,
       VecOps::store(score + x, zero);
       continue;
     }
-    emit(x, finishBlock(r, x, thr, c, a, bl, score) & (0xFFFFu << from) & 0xFFFFu);
+    emit(x, finishBlock(r, x, thr, c, a, bl, score), (0xFFFFu << from) & 0xFFFFu);
   }
   return n;
 }
 
 int suppressRow(const uint8_t* above, const uint8_t* mid, const uint8_t* below, int width, int32_t* keptXs) {
   if (width - 6 < 16) return scalarKernels().suppress(above, mid, below, width, keptXs);
-  const V zero = VecOps::splat(0);
   int n = 0;
   forEachBlock(width, [&](int x, unsigned laneMask) {
     const V v = VecOps::load(mid + x);
-    unsigned mask = VecOps::greaterMask(v, zero) & laneMask;
-    if (mask == 0) return;
+    if (!VecOps::anyNonZero(v)) return;
     V around = VecOps::vmax(VecOps::load(mid + x - 1), VecOps::load(mid + x + 1));
     around = VecOps::vmax(around, VecOps::vmax(VecOps::load(above + x - 1), VecOps::load(above + x)));
     around = VecOps::vmax(around, VecOps::vmax(VecOps::load(above + x + 1), VecOps::load(below + x - 1)));
     around = VecOps::vmax(around, VecOps::vmax(VecOps::load(below + x), VecOps::load(below + x + 1)));
-    for (mask = VecOps::greaterMask(v, around) & laneMask; mask != 0; mask &= mask - 1) {
+    for (unsigned mask = VecOps::laneBits(VecOps::greater(v, around)) & laneMask; mask != 0; mask &= mask - 1) {
       keptXs[n++] = x + __builtin_ctz(mask);
     }
   });

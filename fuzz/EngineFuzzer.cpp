@@ -360,7 +360,7 @@ struct Lent {
 //   5 still image    frame, extra, reply
 //   6 push reply     which(1) reply
 //   7 transport mode mode(1) reply
-//   8 wait           (none)              up to 10 ms for the worker's next request
+//   8 wait           (none)              until the worker has sent (or given up) the request
 //   9 recreate       (none)              destroy the engine (replies still out), build a new one
 //  10 configure      which(1) id(4)      delegates, only while stopped
 //  11 write lent     pick(1) allocLen(1+4) count(1)
@@ -383,6 +383,15 @@ class Harness {
   void step() {
     const int op = in_.u8() % 12;
     if (orzavs_fuzz::verbose()) std::fprintf(stderr, "op %d\n", op);
+    const auto began = std::chrono::steady_clock::now();
+    struct Timer {
+      int op;
+      std::chrono::steady_clock::time_point began;
+      ~Timer() {
+        const auto ms = std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::steady_clock::now() - began).count();
+        if (orzavs_fuzz::verbose() && ms >= 5) std::fprintf(stderr, "  op %d took %lld ms\n", op, static_cast<long long>(ms));
+      }
+    } timer{op, began};
     switch (op) {
       case 0: lifecycle(in_.u8() % 4, true); break;
       case 1: {
@@ -584,11 +593,13 @@ class Harness {
     transport_.push(id, reply);
   }
 
-  // Gives the worker a moment to hand over a request that a frame just dispatched.
+  // Lets the worker hand over the request of a frame just dispatched (or give it up).
   void waitForRequest() {
-    const size_t before = transport_.ids().size();
-    for (int i = 0; i < 100 && transport_.ids().size() == before; ++i) {
-      std::this_thread::sleep_for(std::chrono::microseconds(100));
+    const Tovra::VisualSearchServiceJob& job = engine_->job(0);
+    for (;;) {
+      const Tovra::JobState s = job.state();
+      if (s != Tovra::Queued && s != Tovra::Running) break;
+      std::this_thread::sleep_for(std::chrono::microseconds(50));
     }
   }
 

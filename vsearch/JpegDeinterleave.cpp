@@ -10,15 +10,6 @@
 
 namespace Tovra {
 
-void deinterleaveChromaScalar(const uint8_t* src, size_t pairs, bool cbFirst, uint8_t* cb, uint8_t* cr) {
-  const size_t cbIndex = cbFirst ? 0 : 1;
-  const size_t crIndex = 1 - cbIndex;
-  for (size_t i = 0; i < pairs; ++i) {
-    cb[i] = src[2 * i + cbIndex];
-    cr[i] = src[2 * i + crIndex];
-  }
-}
-
 void deinterleaveChroma(const uint8_t* src, size_t pairs, bool cbFirst, uint8_t* cb, uint8_t* cr) {
   // The first and second byte of each pair go to `first` and `second`.
   uint8_t* first = cbFirst ? cb : cr;

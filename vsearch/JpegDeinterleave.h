@@ -6,12 +6,11 @@
 
 namespace Tovra {
 
-// Splits `pairs` interleaved chroma pairs into a Cb row and a Cr row (each `pairs` bytes).
-// With `cbFirst` the pairs are (Cb, Cr) as in NV12, otherwise (Cr, Cb) as in NV21. Reads exactly
-// 2 * pairs bytes from `src`. Uses SIMD where the target has it; the scalar twin gives the same
-// bytes and is exported for comparison.
+// Splits `pairs` interleaved chroma pairs into a Cb row and a Cr row of `pairs` bytes each. With
+// `cbFirst` the pairs are (Cb, Cr) as in NV12, otherwise (Cr, Cb) as in NV21. Reads exactly
+// 2 * pairs bytes from `src`. Uses NEON or SSE2 where the target has it, 16 pairs at a time, and
+// plain code for the rest; both give the same bytes.
 void deinterleaveChroma(const uint8_t* src, size_t pairs, bool cbFirst, uint8_t* cb, uint8_t* cr);
-void deinterleaveChromaScalar(const uint8_t* src, size_t pairs, bool cbFirst, uint8_t* cb, uint8_t* cr);
 
 }  // namespace Tovra
 

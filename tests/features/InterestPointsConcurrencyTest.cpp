@@ -32,7 +32,8 @@ TEST(InterestPointsConcurrencyTest, ThreadsOnDifferentFramesGetTheirOwnResults) 
     f.w = 90 + 37 * i;
     f.h = 60 + 5 * i;
     f.stride = f.w + 3 * i;
-    f.bytes = fast9ref::makePlane(f.w, f.h, f.stride, i % 2 ? fast9ref::Content::Noise : fast9ref::Content::Blocks, rng);
+    const fast9ref::Content content = i % 2 ? fast9ref::Content::Noise : fast9ref::Content::Blocks;
+    f.bytes = fast9ref::makePlane(f.w, f.h, f.stride, content, rng);
     fast9DetectNonmax(f.bytes.data(), f.w, f.h, f.stride, 50, f.kept, f.scores);
     ImageBuffer image(0, GRAY, f.w, f.h, f.stride, 1, f.bytes.data());
     detectInterestPoints(image, f.points);

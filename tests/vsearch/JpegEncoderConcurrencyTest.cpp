@@ -10,46 +10,33 @@
 namespace {
 
 using namespace jpeg_test;
+using namespace OrzaVSMobile;
 
-// Encoders share no state: threads encoding at once, each with its own vectors, produce the
-// streams a single thread produces.
+// The encoders share no state: threads encoding at once, each with its own vectors, get the
+// streams a single thread gets.
 TEST(JpegEncoderConcurrency, ThreadsEncodingAtOnceGetTheSingleThreadedStreams) {
-  const Yuv420 img = smoothYuv(96, 40);  // a partial last band on every call
-  const std::vector<uint8_t> nv21 = packYuv(img, OrzaVSMobile::NV21);
-  const std::vector<uint8_t> i420 = packYuv(img, OrzaVSMobile::I420);
-  const std::vector<uint8_t> bgr = smoothPacked(96, 40, 3, 96 * 3);
-  std::vector<uint8_t> work, expectNv21, expectI420, expectBgr;
-  ASSERT_TRUE(Tovra::encodeYUVToJpeg(nv21.data(), 40, 96, 96, OrzaVSMobile::NV21, expectNv21, 50, work));
-  ASSERT_TRUE(Tovra::encodeYUVToJpeg(i420.data(), 40, 96, 96, OrzaVSMobile::I420, expectI420, 50, work));
-  ASSERT_TRUE(
-      Tovra::encodePackedToJpeg(bgr.data(), 40, 96, 96 * 3, 3, OrzaVSMobile::BGR, expectBgr, 50, work));
+  const Yuv420 img = makeYuv(96, 40);  // a partial last band on every call
+  const std::vector<uint8_t> frames[] = {packYuv(img, NV21), packYuv(img, I420), img.y};
+  auto encode = [&](int kind, std::vector<uint8_t>& out, std::vector<uint8_t>& work) {
+    if (kind == 2) return Tovra::encodePackedToJpeg(img.y.data(), 40, 96, 96, 1, GRAY, out, 50, work);
+    return Tovra::encodeYUVToJpeg(frames[kind].data(), 40, 96, 96, kind == 0 ? NV21 : I420, out, 50, work);
+  };
+  std::vector<uint8_t> expected[3], work;
+  for (int kind = 0; kind < 3; ++kind) ASSERT_TRUE(encode(kind, expected[kind], work));
 
-  constexpr int kThreads = 4, kRounds = 25;
-  std::vector<int> mismatches(kThreads, 0);
+  std::vector<int> mismatches(4, 0);
   std::vector<std::thread> threads;
-  for (int t = 0; t < kThreads; ++t) {
+  for (int t = 0; t < 4; ++t) {
     threads.emplace_back([&, t] {
       std::vector<uint8_t> out, scratch;
-      for (int i = 0; i < kRounds; ++i) {
-        switch ((t + i) % 3) {
-          case 0:
-            Tovra::encodeYUVToJpeg(nv21.data(), 40, 96, 96, OrzaVSMobile::NV21, out, 50, scratch);
-            mismatches[t] += out != expectNv21;
-            break;
-          case 1:
-            Tovra::encodeYUVToJpeg(i420.data(), 40, 96, 96, OrzaVSMobile::I420, out, 50, scratch);
-            mismatches[t] += out != expectI420;
-            break;
-          default:
-            Tovra::encodePackedToJpeg(bgr.data(), 40, 96, 96 * 3, 3, OrzaVSMobile::BGR, out, 50, scratch);
-            mismatches[t] += out != expectBgr;
-            break;
-        }
+      for (int i = 0; i < 30; ++i) {
+        const int kind = (t + i) % 3;
+        mismatches[t] += !encode(kind, out, scratch) || out != expected[kind];
       }
     });
   }
   for (std::thread& th : threads) th.join();
-  for (int t = 0; t < kThreads; ++t) EXPECT_EQ(mismatches[t], 0) << "thread " << t;
+  for (int t = 0; t < 4; ++t) EXPECT_EQ(mismatches[t], 0) << "thread " << t;
 }
 
 }  // namespace

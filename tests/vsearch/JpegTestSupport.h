@@ -56,7 +56,9 @@ struct Yuv420 {
   int ch() const { return height / 2; }
 };
 
-inline uint8_t clampByte(double v) { return static_cast<uint8_t>(v < 0 ? 0 : v > 255 ? 255 : std::lround(v)); }
+inline uint8_t clampByte(double v) {
+  return static_cast<uint8_t>(v < 0 ? 0 : v > 255 ? 255 : std::lround(v));
+}
 
 // Gentle gradients and waves (what baseline JPEG reproduces well), or independent noise in every
 // sample (which compresses badly, so streams are long).
@@ -78,8 +80,10 @@ inline Yuv420 makeYuv(int width, int height, bool noise = false) {
           noise ? next() : clampByte(128 + 50 * std::sin(c / 23.0) + 40 * std::cos(r / 31.0) + 0.1 * (c - r));
   for (int r = 0; r < img.ch(); ++r)
     for (int c = 0; c < img.cw(); ++c) {
-      img.u[static_cast<size_t>(r) * img.cw() + c] = noise ? next() : clampByte(128 + 40 * std::sin((c + r) / 19.0));
-      img.v[static_cast<size_t>(r) * img.cw() + c] = noise ? next() : clampByte(120 + 35 * std::cos((c - 2 * r) / 27.0));
+      img.u[static_cast<size_t>(r) * img.cw() + c] =
+          noise ? next() : clampByte(128 + 40 * std::sin((c + r) / 19.0));
+      img.v[static_cast<size_t>(r) * img.cw() + c] =
+          noise ? next() : clampByte(120 + 35 * std::cos((c - 2 * r) / 27.0));
     }
   return img;
 }

@@ -212,9 +212,17 @@ public final class VsScan {
       long startNanos = System.nanoTime();
       log.markStart();
       try {
-        Frame f;
         int n = 0;
-        while (n < limit && (f = source.next()) != null) {
+        while (n < limit) {
+          Frame f;
+          try {
+            f = source.next();
+          } catch (IOException e) {
+            // A damaged file (a truncated dump, say): scan what was readable and report it.
+            progress.println("vsscan: " + e.getMessage() + "; the input ends here");
+            break;
+          }
+          if (f == null) break;
           double t = n / fps;
           if (o.pace && !source.stills()) sleepUntil(startNanos + (long) (t * 1e9));
           engine.feed(f, t, o.orientation);

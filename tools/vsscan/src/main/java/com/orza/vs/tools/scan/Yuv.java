@@ -56,19 +56,6 @@ public final class Yuv {
     return v < 0 ? 0 : (v > 255 ? 255 : v);
   }
 
-  /** Rearranges planar I420 (Y, U, V) into NV21 (Y, interleaved V,U). */
-  public static byte[] i420ToNv21(byte[] i420, int w, int h) {
-    byte[] out = new byte[i420.length];
-    int ySize = w * h;
-    int q = ySize / 4;
-    System.arraycopy(i420, 0, out, 0, ySize);
-    for (int i = 0; i < q; i++) {
-      out[ySize + 2 * i] = i420[ySize + q + i]; // V
-      out[ySize + 2 * i + 1] = i420[ySize + i]; // U
-    }
-    return out;
-  }
-
   /** Renders a frame back to RGB (for thumbnails and tests). */
   public static BufferedImage toImage(Frame f) {
     int w = f.width, h = f.height;

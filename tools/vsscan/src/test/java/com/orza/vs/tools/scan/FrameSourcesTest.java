@@ -57,15 +57,11 @@ class FrameSourcesTest {
   }
 
   @Test
-  void oddImagesLoseTheirLastColumnAndRowAndPlanesAreReordered() {
+  void oddImagesLoseTheirLastColumnAndRowAndBadFramesAreRefused() {
     Frame f = Yuv.toNv21(new BufferedImage(7, 5, BufferedImage.TYPE_INT_RGB), 0);
     assertEquals(6, f.width);
     assertEquals(4, f.height);
     assertThrows(IllegalArgumentException.class, () -> Yuv.toNv21(new BufferedImage(1, 9, BufferedImage.TYPE_INT_RGB), 0));
-    // I420 (Y, U, V) of a 2x2 frame to NV21 (Y, V, U).
-    assertArrayEquals(new byte[] {1, 2, 3, 4, 6, 5}, Yuv.i420ToNv21(new byte[] {1, 2, 3, 4, 5, 6}, 2, 2));
-    assertArrayEquals(new byte[] {0, 0, 0, 0, 0, 0, 0, 0, 9, 8, 19, 18},
-        Yuv.i420ToNv21(new byte[] {0, 0, 0, 0, 0, 0, 0, 0, 8, 18, 9, 19}, 4, 2));
     assertThrows(IllegalArgumentException.class, () -> new Frame(0, 4, 2, Frame.NV21, new byte[11]));
     assertThrows(IllegalArgumentException.class, () -> new Frame(0, 3, 2, Frame.NV21, new byte[9]));
   }

@@ -86,6 +86,28 @@ class VsScanTest {
   }
 
   @Test
+  void aTruncatedVideoIsScannedUpToTheDamage() throws IOException {
+    int w = 96, h = 64;
+    java.util.Random rnd = new java.util.Random(9);
+    ByteArrayOutputStream y4m = new ByteArrayOutputStream();
+    y4m.writeBytes(("YUV4MPEG2 W" + w + " H" + h + " F10:1 C420jpeg\n").getBytes(StandardCharsets.US_ASCII));
+    for (int i = 0; i < 3; i++) {
+      byte[] frame = new byte[w * h * 3 / 2];
+      for (int k = 0; k < w * h; k++) frame[k] = (byte) (rnd.nextBoolean() ? 20 : 230);
+      java.util.Arrays.fill(frame, w * h, frame.length, (byte) 128);
+      y4m.writeBytes("FRAME\n".getBytes(StandardCharsets.US_ASCII));
+      y4m.writeBytes(i < 2 ? frame : java.util.Arrays.copyOf(frame, 100)); // the third is cut short
+    }
+    File video = tmp.resolve("cut.y4m").toFile();
+    Files.write(video.toPath(), y4m.toByteArray());
+    Run r = run(video.getPath(), "--out", tmp.resolve("cut").toString(), "--no-progress");
+    assertTrue(r.out.contains("truncated frame 2; the input ends here"), r.out);
+    assertEquals(2, figure(r.out, "frames in +(\\d+)"));
+    assertEquals(0, r.status, r.out);
+    assertTrue(new File(tmp.resolve("cut").toFile(), "index.html").isFile());
+  }
+
+  @Test
   void badUsageAndInputsExitWithStatusTwo() {
     assertEquals(2, run("--frames").status);
     assertEquals(2, run("--size", "12").status);

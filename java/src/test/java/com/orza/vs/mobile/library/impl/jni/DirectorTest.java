@@ -385,6 +385,18 @@ class DirectorTest {
   }
 
   @Test
+  void destroyingThroughTheInterfaceDisconnectsTheJavaTransport() {
+    Transport t = new Transport();
+    long h = ServerDelegate.getCPtr(t);
+    t.swigReleaseOwnership();
+    ServerDelegateInterface owner =
+        new ServerDelegateInterface(OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), true);
+    owner.delete();
+    assertEquals(0, ServerDelegate.getCPtr(t));
+    t.delete();
+  }
+
+  @Test
   void overridingSendServerRequestWrapsTheBase() {
     Wrapping w = new Wrapping();
     ServerRequest request = new ServerRequest();

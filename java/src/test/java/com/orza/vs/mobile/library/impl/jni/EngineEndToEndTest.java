@@ -77,10 +77,26 @@ class EngineEndToEndTest {
     volatile int code = 200;
     volatile String body = REPLY;
     volatile boolean throwOnSend;
+    volatile boolean answerAtOnce;
+    volatile boolean answerThroughHandler;
 
     @Override
     public boolean sendServerRequestImpl(ServerRequest request) {
       if (throwOnSend) throw new IllegalStateException("offline");
+      if (answerAtOnce || answerThroughHandler) {
+        // Answer on the calling thread (the engine's worker), before returning.
+        ServerResponse response = new ServerResponse();
+        response.setId(request.getId());
+        response.setResponseStr(body);
+        sent.add(request.getId() + "|at once|" + Thread.currentThread().getName());
+        if (answerThroughHandler) {
+          request.getResponseHandler().handleServerResponse(response);
+        } else {
+          pushServerResponse(response);
+        }
+        response.delete();
+        return true;
+      }
       // The request is borrowed: copy what is needed before returning.
       final String id = request.getId();
       byte[] jpeg = request.getData().getData();
@@ -190,6 +206,52 @@ class EngineEndToEndTest {
     }
     assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS));
     assertEquals("transport|error VISUAL_SEARCH_SERVICE_MOD RESPONSE_SERVER_ERROR 500", nextEvent());
+  }
+
+  @Test
+  void aTransportAnsweringOnTheWorkerDeliversResultsThere() throws Exception {
+    transport.answerAtOnce = true;
+    engine.startEngine();
+    streamFrame();
+    String sent = transport.sent.poll(10, TimeUnit.SECONDS);
+    assertNotNull(sent);
+    String event = nextEvent();
+    String worker = sent.substring(sent.lastIndexOf('|') + 1);
+    assertTrue(event.startsWith(worker + "|q-1|true|"), event + " / " + sent);
+    assertFalse(worker.equals(Thread.currentThread().getName()));
+
+    // The response handler of a request can be called directly as well.
+    transport.answerAtOnce = false;
+    transport.answerThroughHandler = true;
+    for (int i = 0; i < 50 && transport.sent.isEmpty(); i++) {
+      streamFrame();
+      Thread.sleep(20);
+    }
+    assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS));
+    assertTrue(nextEvent().contains("|q-1|true|"));
+    ServerResponseHandler none = new ServerResponseHandler(0, false);
+    assertThrows(NullPointerException.class, () -> none.handleServerResponse(new ServerResponse()));
+  }
+
+  @Test
+  void framesInTheCallersOwnMemory() {
+    engine.startEngine();
+    ImageBuffer own = new ImageBuffer();
+    own.setFormat(ImageFormat.NV21);
+    own.setWidth(WIDTH);
+    own.setHeight(HEIGHT);
+    own.setWidthStep(WIDTH);
+    own.allocateBuffer(frame.capacity());
+    own.fillBufferWithByteBuffer(frame, frame.capacity());
+    extra.setTimeStamp(time += 0.2);
+    engine.process(own, extra);
+    assertEquals(1, events.pointThreads.size());
+    assertTrue(events.lastPointCount > 0);
+    // A geometry larger than the buffer holds is refused by the engine, not read.
+    own.setHeight(HEIGHT * 4);
+    engine.process(own, extra);
+    assertEquals(1, events.pointThreads.size());
+    own.delete();
   }
 
   @Test

@@ -1,4 +1,5 @@
-// Vector FAST-9 kernel: 16 pixels of a row at a time, SSE2 on x86 and NEON on ARM.
+// Vector FAST-9 kernels (segment test with scores, and suppression): 16 pixels of a row at a
+// time, SSE2 on x86 and NEON on ARM.
 //
 // For a block of 16 centres c and one circle position, the bright margin is p -sat c and the
 // dark margin c -sat p (unsigned saturating subtraction, so a margin is max(difference, 0)).

@@ -78,8 +78,8 @@ ORZAVS_JNI_EXPORT(void, EventDelegateBase_1change_1ownership)(JNIEnv* env, jclas
 }
 
 // Each operation twice: the virtual call (which reaches a Java override through the director)
-// and the base class's own implementation (what a Java override's super call reaches). `Call`
-// is the call expression on `delegate`, with `qualifier` either empty or the base class.
+// and the base class's own implementation (what a Java override's super call reaches).
+// `params` are the JNI parameters after the proxy object, the rest the native arguments.
 #define ORZAVS_EVENT_OPERATION(op, params, ...)                                                     \
   ORZAVS_JNI_EXPORT(void, EventDelegateBase_1##op)(JNIEnv * env, jclass, jlong self, jobject params) { \
     guarded(env, [&] {                                                                            \
@@ -131,6 +131,8 @@ ORZAVS_EVENT_OPERATION(didProcessModuleDecision, ORZAVS_PARAMS(jint module, jint
                        static_cast<Tovra::JudgeVerdictOnModule>(verdict))
 
 #undef ORZAVS_EVENT_OPERATION
+#undef ORZAVS_PARAMS
+#undef ORZAVS_NO_PARAMS
 
 // ---- ServerDelegate, ServerDelegateInterface -----------------------------------------------------
 

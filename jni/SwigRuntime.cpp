@@ -201,19 +201,25 @@ void Director::swig_disconnect_director_self(const char* methodName) {
 // ---------------------------------------------------------------------------------------------
 // JNIEnvWrapper
 
+namespace {
+
+// The JDK's jni.h declares AttachCurrentThread with a void** out-parameter, Android's with
+// JNIEnv**; the parameter type is taken from whichever header is in use.
+template <class EnvOut>
+jint attachCurrentThread(JavaVM* vm, JNIEnv** env, jint (JavaVM::*attach)(EnvOut, void*)) {
+  return (vm->*attach)(reinterpret_cast<EnvOut>(env), nullptr);
+}
+
+}  // namespace
+
 JNIEnvWrapper::JNIEnvWrapper(const Director* director) : director_(director) {
   JavaVM* vm = director_->swig_get_jvm();
   if (vm == nullptr) return;
   void* current = nullptr;
   envStatus_ = vm->GetEnv(&current, JNI_VERSION_1_2);
   // Attaching an attached thread is harmless and returns its environment.
-#if defined(__ANDROID__)
   JNIEnv* env = nullptr;
-  if (vm->AttachCurrentThread(&env, nullptr) == JNI_OK) env_ = env;
-#else
-  void* env = nullptr;
-  if (vm->AttachCurrentThread(&env, nullptr) == JNI_OK) env_ = static_cast<JNIEnv*>(env);
-#endif
+  if (attachCurrentThread(vm, &env, &JavaVM::AttachCurrentThread) == JNI_OK) env_ = env;
 }
 
 JNIEnvWrapper::~JNIEnvWrapper() {

@@ -44,16 +44,19 @@ if command -v valgrind >/dev/null; then
   g++ -std=c++17 -O3 -DNDEBUG -I. scripts/insn-count/fast9_insn_driver.cpp bench/BenchFrames.cpp \
     "$x86/liborzavs.a" -ljpeg -pthread -o "$x86/fast9_insn_driver"
 fi
-x86_count() {
-  valgrind --tool=callgrind --callgrind-out-file=/dev/null "$x86/fast9_insn_driver" "$1" "$2" "$3" 2>&1 |
-    sed -n 's/^==[0-9]*== Collected : //p'
-}
-
-per_call() {  # counter frame path -> instructions of one call
+per_call_arm() {  # frame path -> instructions of one call
   local a b
-  a=$("$1" "$2" "$3" 1)
-  b=$("$1" "$2" "$3" $((1 + calls)))
+  a=$(arm_count "$1" "$2" 1)
+  b=$(arm_count "$1" "$2" $((1 + calls)))
   echo $(((b - a) / calls))
+}
+# callgrind counts only inside the detector's calls (inclusive), so one run per figure.
+per_call_x86() {
+  local n
+  n=$(valgrind --tool=callgrind --callgrind-out-file=/dev/null --collect-atstart=no \
+        "--toggle-collect=OrzaVSMobile::fast9DetectNonmax*" "$x86/fast9_insn_driver" "$1" "$2" "$calls" 2>&1 |
+      sed -n 's/^==[0-9]*== Collected : //p')
+  echo $((n / calls))
 }
 
 mapfile -t frames < <(printf '%s\n' "640x480 smooth" "640x480 texture" "1280x720 smooth" "1280x720 texture" \
@@ -63,15 +66,15 @@ mapfile -t frames < <(printf '%s\n' "640x480 smooth" "640x480 texture" "1280x720
 echo "FAST-9 detection with suppression, threshold 50: instructions per call"
 printf '%-20s %14s %14s %8s\n' "armv7-a (qemu)" "NEON" "scalar" "ratio"
 for f in "${frames[@]}"; do
-  v=$(per_call arm_count "$f" best)
-  s=$(per_call arm_count "$f" scalar)
+  v=$(per_call_arm "$f" best)
+  s=$(per_call_arm "$f" scalar)
   printf '%-20s %14d %14d %7.2fx\n' "$f" "$v" "$s" "$(awk -v s="$s" -v v="$v" 'BEGIN { print s / v }')"
 done
 if [ -n "$x86" ]; then
   printf '%-20s %14s %14s %8s\n' "x86-64 (callgrind)" "SSE2" "scalar" "ratio"
   for f in "${frames[@]}"; do
-    v=$(per_call x86_count "$f" best)
-    s=$(per_call x86_count "$f" scalar)
+    v=$(per_call_x86 "$f" best)
+    s=$(per_call_x86 "$f" scalar)
     printf '%-20s %14d %14d %7.2fx\n' "$f" "$v" "$s" "$(awk -v s="$s" -v v="$v" 'BEGIN { print s / v }')"
   done
 fi

@@ -34,6 +34,9 @@ class LateReplyTest : public ::testing::Test {
   }
   // Sends one frame; returns once the worker has left the job awaiting its reply.
   std::string sendFrame(double t) {
+    // The worker settles the job just after the send returns; a frame arriving before that
+    // would only be held.
+    EXPECT_TRUE(waitFor([&] { return !engine->job(0).isBusy(); }));
     const size_t before = transport.sentCount();
     OrzaVSMobile::ImageBuffer image(0, OrzaVSMobile::GRAY, 64, 48, 64, 1, pixels.data());
     OrzaVSMobile::ExtraFrameData extra;

@@ -120,7 +120,8 @@ TEST(JpegEncoder, PackedFramesDecodeCloseToTheirInputWhateverTheirPadding) {
   const Decoded g = decodeJpeg(packedJpeg(grey, w, h, w, 1, GRAY));
   EXPECT_EQ(g.colorSpace, JCS_GRAYSCALE);
   EXPECT_GE(psnr(g.pixels.data(), 1, grey.data(), 1, grey.size()), 48.0);  // measured 54.4 dB
-  for (int channels : {1, 3, 4})                                           // one-pixel frames
+  // One-pixel frames.
+  for (int channels : {1, 3, 4})
     EXPECT_EQ(
         decodeJpeg(packedJpeg(std::vector<uint8_t>(channels, 200), 1, 1, channels, channels, BGRA)).width, 1);
 }

@@ -26,6 +26,8 @@ import java.util.concurrent.ScheduledExecutorService;
 import java.util.concurrent.ScheduledThreadPoolExecutor;
 import java.util.concurrent.TimeUnit;
 import java.util.concurrent.atomic.AtomicLong;
+import java.util.concurrent.atomic.AtomicLongArray;
+import java.util.concurrent.RejectedExecutionException;
 
 /**
  * A long run of the library through its Java binding, as an app uses it, with an unreliable
@@ -104,6 +106,7 @@ public final class Soak {
   static final class Counters {
     final AtomicLong frames = new AtomicLong();
     final AtomicLong lentFrames = new AtomicLong();
+    final AtomicLong badFrames = new AtomicLong();
     final AtomicLong pointCallbacks = new AtomicLong();
     final AtomicLong points = new AtomicLong();
     final AtomicLong sends = new AtomicLong();
@@ -119,7 +122,7 @@ public final class Soak {
     final AtomicLong afterStop = new AtomicLong();
     final AtomicLong resets = new AtomicLong();
     final AtomicLong stills = new AtomicLong();
-    final long[] fates = new long[Fate.values().length];
+    final AtomicLongArray fates = new AtomicLongArray(Fate.values().length);
   }
 
   private void fail(String what) {
@@ -214,19 +217,23 @@ public final class Soak {
         }
         counters.sends.incrementAndGet();
         final Fate fate = forceAnswer ? Fate.OK : pickFate();
-        counters.fates[fate.ordinal()]++;
+        counters.fates.incrementAndGet(fate.ordinal());
         long delayMs;
         switch (fate) {
           case OK_SLOW: delayMs = 200 + random(600); break;
           case NEVER: return true;
           default: delayMs = random(60); break;
         }
-        pusher.schedule(new Runnable() {
-          @Override
-          public void run() {
-            answer(id, fate, sentAt);
-          }
-        }, delayMs, TimeUnit.MILLISECONDS);
+        try {
+          pusher.schedule(new Runnable() {
+            @Override
+            public void run() {
+              answer(id, fate, sentAt);
+            }
+          }, delayMs, TimeUnit.MILLISECONDS);
+        } catch (RejectedExecutionException e) {
+          // Shutting down: the request stays unanswered and is answered after the final stop.
+        }
         return true;
       } catch (Throwable t) {
         fail("sendServerRequestImpl threw " + t);
@@ -312,15 +319,9 @@ public final class Soak {
   private static byte[][] makeFrames(int count, long seed) {
     Random r = new Random(seed);
     int card = 96;
+    // Speckle: isolated bright and dark pixels give FAST many corners (more than 50 a frame).
     byte[] texture = new byte[card * card];
-    for (int y = 0; y < card; y += 4) {
-      for (int x = 0; x < card; x += 4) {
-        byte v = (byte) (r.nextBoolean() ? 220 : 30);
-        for (int dy = 0; dy < 4; ++dy) {
-          for (int dx = 0; dx < 4; ++dx) texture[(y + dy) * card + x + dx] = v;
-        }
-      }
-    }
+    for (int k = 0; k < texture.length; ++k) texture[k] = (byte) (r.nextInt(8) == 0 ? (r.nextBoolean() ? 230 : 20) : 128);
     byte[][] frames = new byte[count][];
     for (int i = 0; i < count; ++i) {
       byte[] f = new byte[WIDTH * HEIGHT * 3 / 2];
@@ -396,11 +397,7 @@ public final class Soak {
       engine.requestImageBuffer(image, key);
       extra.setTimeStamp(now());
       extra.setScreenOrient(90 * (n++ % 4));
-      if (key[0] == null || key[0].isEmpty()) {
-        // Not running, or every record is out: the frame goes in without a lent buffer.
-        image.setData(null);
-        return;
-      }
+      if (key[0] == null || key[0].isEmpty()) return;  // not running, or every record is out
       luma.clear();
       luma.put(pixels, 0, WIDTH * HEIGHT);
       chroma.clear();
@@ -434,6 +431,12 @@ public final class Soak {
       int copied = image.fillBuffer(pixels, pixels.length);
       if (copied != pixels.length) fail("own buffer took " + copied + " of " + pixels.length + " bytes");
       extra.setTimeStamp(now());
+      // Now and then a frame described wrongly, as a buggy app would: taller than its buffer,
+      // rows shorter than the width, an unknown format. The engine must drop it and go on.
+      if (n % 37 == 0) image.setHeight(HEIGHT * 4);
+      if (n % 41 == 0) image.setWidthStep(WIDTH / 2);
+      if (n % 43 == 0) image.setFormat(ImageFormat.BGRA);
+      if (n % 37 == 0 || n % 41 == 0 || n % 43 == 0) counters.badFrames.incrementAndGet();
       engine.process(image, extra);
     }
   }
@@ -553,11 +556,13 @@ public final class Soak {
     samples.add(sample((System.nanoTime() - startNs) / 1e9));
     int globalsLate = Resources.jniGlobalRefs();
 
-    // Shut down: stop the engine, then answer everything still out. Nothing may call back now.
+    // Shut down: let the last request go out and the scheduled replies arrive, stop the engine,
+    // then answer everything still out. Nothing may call back after the stop.
+    Thread.sleep(500);
+    pusher.shutdown();
+    if (!pusher.awaitTermination(10, TimeUnit.SECONDS)) fail("scheduled replies did not finish");
     reset(engine::stopEngine);
     stopped = true;
-    pusher.shutdown();
-    pusher.awaitTermination(5, TimeUnit.SECONDS);
     List<String> left;
     synchronized (sendLock) {
       left = new ArrayList<>(outstanding);
@@ -583,12 +588,14 @@ public final class Soak {
     double threadsEarly = median(early, s -> s.threads);
     double threadsLate = median(late, s -> s.threads);
 
-    System.out.printf(Locale.ROOT, "soak: %.0f s, %d frames (%d through lent buffers), %d still images, %d resets%n",
-        seconds, counters.frames.get(), counters.lentFrames.get(), counters.stills.get(), counters.resets.get());
+    System.out.printf(Locale.ROOT,
+        "soak: %.0f s, %d frames (%d through lent buffers, %d described wrongly), %d still images, %d resets%n",
+        seconds, counters.frames.get(), counters.lentFrames.get(), counters.badFrames.get(), counters.stills.get(),
+        counters.resets.get());
     System.out.printf(Locale.ROOT, "soak: interest points: %d callbacks, %d points%n",
         counters.pointCallbacks.get(), counters.points.get());
     StringBuilder fates = new StringBuilder();
-    for (Fate f : Fate.values()) fates.append(' ').append(f.name().toLowerCase(Locale.ROOT)).append('=').append(counters.fates[f.ordinal()]);
+    for (Fate f : Fate.values()) fates.append(' ').append(f.name().toLowerCase(Locale.ROOT)).append('=').append(counters.fates.get(f.ordinal()));
     System.out.printf(Locale.ROOT, "soak: requests sent %d; fates:%s%n", counters.sends.get(), fates);
     System.out.printf(Locale.ROOT,
         "soak: replies pushed %d (%d with the request's id); callbacks: %d didDecode, %d didReceiveServerError; "

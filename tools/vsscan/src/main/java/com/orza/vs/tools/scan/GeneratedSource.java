@@ -2,7 +2,6 @@ package com.orza.vs.tools.scan;
 
 import java.awt.BasicStroke;
 import java.awt.Color;
-import java.awt.Font;
 import java.awt.GradientPaint;
 import java.awt.Graphics2D;
 import java.awt.Rectangle;
@@ -101,7 +100,6 @@ public final class GeneratedSource implements FrameSource {
     BufferedImage img = new BufferedImage(w, h, BufferedImage.TYPE_INT_RGB);
     Graphics2D g = img.createGraphics();
     g.setRenderingHint(RenderingHints.KEY_ANTIALIASING, RenderingHints.VALUE_ANTIALIAS_ON);
-    g.setRenderingHint(RenderingHints.KEY_TEXT_ANTIALIASING, RenderingHints.VALUE_TEXT_ANTIALIAS_ON);
     g.setColor(new Color(248, 246, 236));
     g.fillRect(0, 0, w, h);
     // Checkerboard band across the top, lettering in the middle, bars like a barcode below.
@@ -114,11 +112,11 @@ public final class GeneratedSource implements FrameSource {
         g.fillRect(x, y, sq, sq);
       }
     }
+    // Lettering in the built-in pixel font, capitals about a sixth of the card's height tall.
     int textSize = Math.max(8, h / 5);
-    g.setFont(new Font(Font.SANS_SERIF, Font.BOLD, textSize));
-    g.setColor(new Color(190, 30, 40));
+    int textScale = Math.max(1, Math.round(textSize * 0.72f / BitmapFont.ASCENT));
     int textBase = checkerBottom + textSize;
-    g.drawString("ORZA", sq, textBase);
+    BitmapFont.draw(img, "ORZA", sq, textBase - BitmapFont.ASCENT * textScale, textScale, 0xBE1E28);
     Random rnd = new Random(7);
     int x = sq / 2;
     int top = textBase + sq / 2;

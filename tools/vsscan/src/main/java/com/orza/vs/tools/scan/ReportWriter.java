@@ -3,8 +3,6 @@ package com.orza.vs.tools.scan;
 import java.awt.AlphaComposite;
 import java.awt.BasicStroke;
 import java.awt.Color;
-import java.awt.Font;
-import java.awt.FontMetrics;
 import java.awt.Graphics2D;
 import java.awt.RenderingHints;
 import java.awt.geom.Path2D;
@@ -97,7 +95,6 @@ public final class ReportWriter {
     Graphics2D g = img.createGraphics();
     g.drawImage(src, 0, 0, null);
     g.setRenderingHint(RenderingHints.KEY_ANTIALIASING, RenderingHints.VALUE_ANTIALIAS_ON);
-    g.setRenderingHint(RenderingHints.KEY_TEXT_ANTIALIASING, RenderingHints.VALUE_TEXT_ANTIALIAS_ON);
     float scale = Math.max(1f, Math.min(w, h) / 480f);
 
     if (frame != null && frame.points != null) {
@@ -112,7 +109,9 @@ public final class ReportWriter {
       }
     }
 
-    Font labelFont = new Font(Font.SANS_SERIF, Font.BOLD, Math.round(13 * scale));
+    // Labels and banners use the built-in pixel font: two font pixels per image pixel at
+    // 640x480, more for larger frames, so that they stay legible in the thumbnails.
+    int ts = Math.max(1, Math.round(Math.min(w, h) / 240f));
     for (ScanLog.Result res : r.results) {
       if (res.location == null) continue;
       Path2D.Float quad = new Path2D.Float();
@@ -125,15 +124,11 @@ public final class ReportWriter {
       g.setStroke(new BasicStroke(2.5f * scale));
       g.setColor(BOX);
       g.draw(quad);
-      String label = res.type + (res.content.isEmpty() ? "" : ": " + res.content);
-      label(g, labelFont, label, res.location[0], res.location[1], BOX, w);
     }
-
     // Header: request number, frame, outcome. Footer: the search terms.
-    Font small = new Font(Font.SANS_SERIF, Font.PLAIN, Math.round(12 * scale));
     String head = String.format(Locale.ROOT, "#%d  frame %s  %s", r.number, r.frameIndex >= 0 ? String.valueOf(r.frameIndex) : "?",
         outcome(r));
-    banner(g, small, head, 0, w, true, h);
+    int headHeight = banner(img, g, head, true, ts);
     StringBuilder terms = new StringBuilder();
     for (ScanLog.Result res : r.results) {
       if (res.location == null && !res.content.isEmpty()) {
@@ -141,46 +136,57 @@ public final class ReportWriter {
         terms.append(res.type).append(": ").append(res.content);
       }
     }
-    if (terms.length() > 0) banner(g, small, terms.toString(), 0, w, false, h);
+    if (terms.length() > 0) banner(img, g, terms.toString(), false, ts);
+
+    // Box labels last, so that no outline or banner covers them, and kept clear of the header.
+    for (ScanLog.Result res : r.results) {
+      if (res.location == null) continue;
+      String label = res.type + (res.content.isEmpty() ? "" : ": " + res.content);
+      label(img, g, label, res.location[0], res.location[1], headHeight, ts);
+    }
     g.dispose();
     return img;
   }
 
-  private static void label(Graphics2D g, Font font, String text, float x, float y, Color color, int imgWidth) {
-    g.setFont(font);
-    FontMetrics fm = g.getFontMetrics();
-    String t = ellipsize(text, fm, imgWidth - 8);
-    int tw = fm.stringWidth(t) + 8;
-    int th = fm.getHeight() + 2;
+  /**
+   * A filled tag in the box colour just above (x, y), or just below it when that would reach
+   * above {@code minY}. The corner comes from the server and may lie anywhere.
+   */
+  private static void label(BufferedImage img, Graphics2D g, String text, float x, float y, int minY, int ts) {
+    int imgWidth = img.getWidth();
+    int pad = 3 * ts;
+    String t = BitmapFont.fit(text, imgWidth - 2 * pad, ts);
+    int tw = BitmapFont.width(t, ts) + 2 * pad;
+    int th = BitmapFont.height(ts) + 4 * ts;
     int lx = Math.max(0, Math.min(Math.round(x), imgWidth - tw));
     int ly = Math.round(y) - th - 2;
-    if (ly < 0) ly = Math.round(y) + 2;
-    g.setColor(color);
+    if (ly < minY) ly = Math.max(minY, Math.round(y) + 2);
+    ly = Math.min(ly, img.getHeight() - th);
+    g.setColor(BOX);
     g.fillRect(lx, ly, tw, th);
-    g.setColor(Color.WHITE);
-    g.drawString(t, lx + 4, ly + fm.getAscent() + 1);
+    BitmapFont.draw(img, t, lx + pad, ly + 3 * ts, ts, 0xFFFFFF);
   }
 
-  private static void banner(Graphics2D g, Font font, String text, int x, int width, boolean top, int imgHeight) {
-    g.setFont(font);
-    FontMetrics fm = g.getFontMetrics();
-    String t = ellipsize(text, fm, width - 12);
-    int th = fm.getHeight() + 6;
-    int y = top ? 0 : imgHeight - th;
+  /**
+   * A darkened strip across the top or bottom of the frame with up to two lines of text;
+   * returns its height.
+   */
+  private static int banner(BufferedImage img, Graphics2D g, String text, boolean top, int ts) {
+    int width = img.getWidth();
+    int pad = 3 * ts;
+    List<String> lines = BitmapFont.wrap(text, width - 2 * pad, ts, 2);
+    if (lines.isEmpty()) return 0;
+    int lineH = BitmapFont.height(ts) + 2 * ts;
+    int th = lines.size() * lineH + 2 * ts;
+    int y = top ? 0 : img.getHeight() - th;
     g.setComposite(AlphaComposite.getInstance(AlphaComposite.SRC_OVER, 0.62f));
     g.setColor(Color.BLACK);
-    g.fillRect(x, y, width, th);
+    g.fillRect(0, y, width, th);
     g.setComposite(AlphaComposite.SrcOver);
-    g.setColor(Color.WHITE);
-    g.drawString(t, x + 6, y + 3 + fm.getAscent());
-  }
-
-  private static String ellipsize(String s, FontMetrics fm, int maxWidth) {
-    if (fm.stringWidth(s) <= maxWidth) return s;
-    String e = "...";
-    int n = s.length();
-    while (n > 0 && fm.stringWidth(s.substring(0, n) + e) > maxWidth) n--;
-    return s.substring(0, n) + e;
+    for (int i = 0; i < lines.size(); i++) {
+      BitmapFont.draw(img, lines.get(i), pad, y + 3 * ts + i * lineH, ts, 0xFFFFFF);
+    }
+    return th;
   }
 
   static BufferedImage scale(BufferedImage src, int width) {

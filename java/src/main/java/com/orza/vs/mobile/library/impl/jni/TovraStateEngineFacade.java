@@ -17,15 +17,28 @@ package com.orza.vs.mobile.library.impl.jni;
  *   engine.delete();
  * </pre>
  *
- * <p>The proxy keeps a reference to the event delegate and to every transport given to it, so
- * that they cannot be collected while the engine may call them; delete the engine before
- * deleting them.
+ * <p>Delegates: while the engine lives, this proxy holds the event delegate and every transport
+ * given to it, and owns their native objects, so that neither a collection nor a finalizer
+ * running before this proxy's can free a delegate the engine still calls. {@link #delete} hands
+ * them back (and frees those the application deleted meanwhile). Delete the engine first.
  */
 public class TovraStateEngineFacade {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
-  // Delegates the native engine calls; held so that they stay reachable while it lives.
-  private final java.util.List<Object> swigDelegates = new java.util.ArrayList<Object>();
+  // A delegate the native engine calls, held (and its native object owned) while it lives.
+  private static final class HeldDelegate {
+    final Object proxy;
+    final long handle;
+    final boolean ownershipTaken;
+
+    HeldDelegate(Object proxy, long handle, boolean ownershipTaken) {
+      this.proxy = proxy;
+      this.handle = handle;
+      this.ownershipTaken = ownershipTaken;
+    }
+  }
+
+  private final java.util.List<HeldDelegate> swigDelegates = new java.util.ArrayList<HeldDelegate>();
 
   public TovraStateEngineFacade(long cPtr, boolean cMemoryOwn) {
     swigCMemOwn = cMemoryOwn;
@@ -41,7 +54,7 @@ public class TovraStateEngineFacade {
     delete();
   }
 
-  /** Stops and destroys the engine if this proxy owns it. */
+  /** Stops and destroys the engine if this proxy owns it, then hands the delegates back. */
   public synchronized void delete() {
     if (swigCPtr != 0) {
       if (swigCMemOwn) {
@@ -50,16 +63,48 @@ public class TovraStateEngineFacade {
       }
       swigCPtr = 0;
     }
+    java.util.List<HeldDelegate> held;
     synchronized (swigDelegates) {
+      held = new java.util.ArrayList<HeldDelegate>(swigDelegates);
       swigDelegates.clear();
+    }
+    for (HeldDelegate d : held) {
+      if (!d.ownershipTaken) continue;
+      if (d.proxy instanceof EventDelegateBase) {
+        EventDelegateBase events = (EventDelegateBase) d.proxy;
+        if (EventDelegateBase.getCPtr(events) != 0) {
+          events.swigTakeOwnership();
+        } else {
+          OrzaVSMobileJNI.delete_EventDelegateBase(d.handle);  // deleted by the app meanwhile
+        }
+      } else {
+        ServerDelegate transport = (ServerDelegate) d.proxy;
+        if (ServerDelegate.getCPtr(transport) != 0) {
+          transport.swigTakeOwnership();
+        } else {
+          OrzaVSMobileJNI.delete_ServerDelegate(d.handle);
+        }
+      }
     }
   }
 
-  private void keep(Object delegate) {
-    if (delegate != null) {
-      synchronized (swigDelegates) {
-        swigDelegates.add(delegate);
-      }
+  // Holds a delegate; when Java owns its native object, ownership passes to this facade until
+  // delete() (the native side then refers to the Java object strongly).
+  private void keep(EventDelegateBase events) {
+    if (events == null) return;
+    boolean take = events.swigCMemOwn && EventDelegateBase.getCPtr(events) != 0;
+    if (take) events.swigReleaseOwnership();
+    synchronized (swigDelegates) {
+      swigDelegates.add(new HeldDelegate(events, EventDelegateBase.getCPtr(events), take));
+    }
+  }
+
+  private void keep(ServerDelegate transport) {
+    if (transport == null) return;
+    boolean take = transport.swigCMemOwn && ServerDelegate.getCPtr(transport) != 0;
+    if (take) transport.swigReleaseOwnership();
+    synchronized (swigDelegates) {
+      swigDelegates.add(new HeldDelegate(transport, ServerDelegate.getCPtr(transport), take));
     }
   }
 

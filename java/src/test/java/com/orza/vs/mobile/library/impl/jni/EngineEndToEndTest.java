@@ -300,6 +300,47 @@ class EngineEndToEndTest {
   }
 
   @Test
+  void theEngineHoldsItsDelegatesUntilItIsDeleted() {
+    Events held = new Events();
+    Transport heldTransport = new Transport();
+    TovraStateEngineFacade other = new TovraStateEngineFacade(held);
+    other.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, heldTransport);
+    assertFalse(held.swigCMemOwn, "the engine owns its delegate while it lives");
+    assertFalse(heldTransport.swigCMemOwn);
+    java.lang.ref.WeakReference<Events> ref = new java.lang.ref.WeakReference<Events>(held);
+    held = null;
+    for (int i = 0; i < 5; i++) System.gc();
+    assertNotNull(ref.get(), "a delegate in use is not collected");
+    heldTransport.delete();  // deleted too early: its native object lives until the engine goes
+    other.startEngine();
+    other.delete();
+    assertTrue(ref.get().swigCMemOwn, "ownership is handed back");
+    assertEquals(0, ServerDelegate.getCPtr(heldTransport));
+    ref.get().delete();
+    heldTransport.executor.shutdown();
+  }
+
+  private static void abandonRunningEngine() {
+    Events abandoned = new Events();
+    Transport abandonedTransport = new Transport();
+    abandonedTransport.executor.shutdown();
+    TovraStateEngineFacade engine = new TovraStateEngineFacade(abandoned);
+    engine.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, abandonedTransport);
+    engine.startEngine();
+  }
+
+  @Test
+  void anAbandonedEngineIsFinalizedBeforeItsDelegates() {
+    // Engine and delegates become unreachable together; whatever order their finalizers run
+    // in, the delegates' native objects outlive the engine.
+    for (int round = 0; round < 3; round++) abandonRunningEngine();
+    for (int i = 0; i < 10; i++) {
+      System.gc();
+      System.runFinalization();
+    }
+  }
+
+  @Test
   void facadeOperationsAndArgumentChecks() {
     CameraResRequirement requirement = new CameraResRequirement();
     engine.getCameraResRequirement(requirement);

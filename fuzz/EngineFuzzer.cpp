@@ -311,7 +311,8 @@ bool makeFrame(Reader& in, ClientFrame& frame) {
       img.data = nullptr;
       break;
     default:
-      frame.block = std::make_unique<GuardedBlock>(static_cast<size_t>(bytes));
+      frame.block = std::make_unique<GuardedBlock>(
+          static_cast<size_t>(bytes), memory % 6 >= 4 ? GuardedBlock::Aligned : GuardedBlock::EndAtPage);
       fillPixels(pixelMode, seed, frame.block->data(), frame.block->size(), img.widthStep);
       img.data = frame.block->data();
       break;
@@ -351,11 +352,23 @@ struct Lent {
   bool returned = false;  // its key went back to the engine: the client lets go of the memory
 };
 
+// In verbose runs, names the ops that took 5 ms or more (what makes an input slow).
+struct SlowOpReport {
+  int op;
+  std::chrono::steady_clock::time_point began;
+  ~SlowOpReport() {
+    if (!orzavs_fuzz::verbose()) return;
+    const auto ms = std::chrono::duration_cast<std::chrono::milliseconds>(
+                        std::chrono::steady_clock::now() - began).count();
+    if (ms >= 5) std::fprintf(stderr, "  op %d took %lld ms\n", op, static_cast<long long>(ms));
+  }
+};
+
 // Ops and their fields (each field has a fixed size; see make_engine_seeds.py):
 //   0 lifecycle      which(1)            start, stop, pause, resume; waits for the worker first
 //   1 lifecycle      which(1) wait(1)    the same, waiting only when wait is odd
 //   2 process        frame, extra, key(1)
-//   3 request        description         requestImageBuffer, then the camera fills the memory
+//   3 request        description, pixels requestImageBuffer, then the camera fills the memory
 //   4 process lent   pick(1) change(1) value(4) extra, key(1)
 //   5 still image    frame, extra, reply
 //   6 push reply     which(1) reply
@@ -363,7 +376,7 @@ struct Lent {
 //   8 wait           (none)              until the worker has sent (or given up) the request
 //   9 recreate       (none)              destroy the engine (replies still out), build a new one
 //  10 configure      which(1) id(4)      delegates, only while stopped
-//  11 write lent     pick(1) allocLen(1+4) count(1)
+//  11 write lent     pick(1) how(1) allocLen(4) count(1)
 // where frame = description, memory(1) delta(1), pixels: mode(1) seed(4);
 //       description = format(5) width(5) height(5) channels(1) stride(5);
 //       extra = time(5) orientation(1+4) flat(1); reply = code(1+4) body(1 [+1+n]) rtt(1).
@@ -383,15 +396,7 @@ class Harness {
   void step() {
     const int op = in_.u8() % 12;
     if (orzavs_fuzz::verbose()) std::fprintf(stderr, "op %d\n", op);
-    const auto began = std::chrono::steady_clock::now();
-    struct Timer {
-      int op;
-      std::chrono::steady_clock::time_point began;
-      ~Timer() {
-        const auto ms = std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::steady_clock::now() - began).count();
-        if (orzavs_fuzz::verbose() && ms >= 5) std::fprintf(stderr, "  op %d took %lld ms\n", op, static_cast<long long>(ms));
-      }
-    } timer{op, began};
+    SlowOpReport report{op, std::chrono::steady_clock::now()};
     switch (op) {
       case 0: lifecycle(in_.u8() % 4, true); break;
       case 1: {

@@ -173,7 +173,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     bytes = static_cast<uint64_t>(height - 1) * static_cast<uint64_t>(stride) + static_cast<uint64_t>(width);
     if (bytes > (1u << 20) || static_cast<uint64_t>(width) * static_cast<uint64_t>(height) > 8000) return 0;
   }
-  GuardedBlock block(static_cast<size_t>(bytes));
+  GuardedBlock block(static_cast<size_t>(bytes), in.ConsumeBool() ? GuardedBlock::Aligned : GuardedBlock::EndAtPage);
   const Plane plane{block.data(), usable ? width : 0, usable ? height : 0, stride};
   if (usable) {
     std::memset(block.data(), 0x5A, block.size());  // row padding: never part of the plane

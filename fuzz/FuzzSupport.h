@@ -52,15 +52,22 @@ inline uint32_t checksum(const std::vector<uint8_t>& bytes) {
   return h;
 }
 
-// `size` bytes that end exactly where an unreadable page begins, with the bytes in front of
-// them poisoned for AddressSanitizer. Any read past the end faults at once, even from code that
-// is not instrumented (the system's JPEG library); a read before the start is reported by
-// AddressSanitizer in instrumented code. The bytes start out zero.
+// `size` bytes followed by an unreadable page, with everything around them poisoned for
+// AddressSanitizer. Two placements, since AddressSanitizer marks memory in 8-byte granules and
+// can poison the end of a granule but not its start:
+//  - EndAtPage: the last byte is the last of its page, so any read past the end faults at once,
+//    even from code that is not instrumented (the system's JPEG library); a read just before the
+//    start is caught only when the start falls on a granule boundary.
+//  - Aligned: the start is 8-byte aligned, so instrumented code is caught reading even one byte
+//    before the start or after the end; uninstrumented code only once it reaches the page.
+// The bytes start out zero.
 class GuardedBlock {
  public:
-  explicit GuardedBlock(size_t size) : size_(size) {
+  enum Placement { EndAtPage, Aligned };
+
+  explicit GuardedBlock(size_t size, Placement placement = EndAtPage) : size_(size) {
     const size_t page = static_cast<size_t>(sysconf(_SC_PAGESIZE));
-    const size_t body = (size + page - 1) / page * page;
+    const size_t body = (size + 8 + page - 1) / page * page;
     mapLen_ = body + page;
     void* base = mmap(nullptr, mapLen_, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
     if (base == MAP_FAILED) {
@@ -69,11 +76,15 @@ class GuardedBlock {
     }
     map_ = static_cast<uint8_t*>(base);
     mprotect(map_ + body, page, PROT_NONE);
-    data_ = map_ + body - size;
-    ORZAVS_FUZZ_POISON(map_, body - size);
+    size_t offset = body - size;
+    if (placement == Aligned) offset &= ~static_cast<size_t>(7);
+    data_ = map_ + offset;
+    ORZAVS_FUZZ_POISON(map_, offset);
+    ORZAVS_FUZZ_POISON(data_ + size, body - offset - size);
+    body_ = body;
   }
   ~GuardedBlock() {
-    ORZAVS_FUZZ_UNPOISON(map_, mapLen_ - static_cast<size_t>(sysconf(_SC_PAGESIZE)));
+    ORZAVS_FUZZ_UNPOISON(map_, body_);
     munmap(map_, mapLen_);
   }
   GuardedBlock(const GuardedBlock&) = delete;
@@ -95,6 +106,7 @@ class GuardedBlock {
  private:
   uint8_t* map_ = nullptr;
   size_t mapLen_ = 0;
+  size_t body_ = 0;
   uint8_t* data_ = nullptr;
   size_t size_ = 0;
 };

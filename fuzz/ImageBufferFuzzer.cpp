@@ -45,7 +45,7 @@ int32_t pickLength(FuzzedDataProvider& in) {
 // A source of `length` readable bytes (none for a negative length), cut from the input.
 std::unique_ptr<GuardedBlock> makeSource(FuzzedDataProvider& in, int32_t length) {
   const size_t n = length > 0 ? static_cast<size_t>(length) : 0;
-  auto block = std::make_unique<GuardedBlock>(n);
+  auto block = std::make_unique<GuardedBlock>(n, in.ConsumeBool() ? GuardedBlock::Aligned : GuardedBlock::EndAtPage);
   std::vector<uint8_t> bytes = in.ConsumeBytes<uint8_t>(std::min<size_t>(n, 64));
   block->fill(bytes.data(), bytes.size());
   return block;
@@ -180,7 +180,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
       }
       case 7: {  // lend outside memory to the buffer
         const int32_t len = in.ConsumeIntegralInRange<int32_t>(-4, 4096);
-        lentBlocks.push_back(std::make_unique<GuardedBlock>(len > 0 ? static_cast<size_t>(len) : 0));
+        lentBlocks.push_back(std::make_unique<GuardedBlock>(
+            len > 0 ? static_cast<size_t>(len) : 0, in.ConsumeBool() ? GuardedBlock::Aligned : GuardedBlock::EndAtPage));
         uint8_t* block = lentBlocks.back()->data();
         b.lend(block, len);
         m.lent = block;

@@ -114,6 +114,12 @@ SEEDS = {
     + WAIT + mode(5) + process(GRAY, 32, 32, step_ms=150) + WAIT + mode(0) + stop(),
     "late_replies": start() + process(NV21, 48, 32) + WAIT + RECREATE + push(1) + start()
     + process(NV21, 48, 32) + WAIT + stop() + push() + RECREATE + push(),
+    # Tiny frames while a frame is held: the sharpness margins shrink to 0 and its samples meet
+    # the plane's edges.
+    "tiny_frames_while_held": start() + process(NV21, 64, 48) + WAIT + process(NV21, 64, 48, step_ms=150)
+    + b"".join(process(GRAY, w, h, pixels=NOISE, step_ms=20) for w, h in
+               ((1, 1), (2, 2), (3, 3), (20, 4), (4, 20), (24, 5), (25, 5), (15, 15), (16, 6), (5, 64)))
+    + push() + stop(),
     "odd_geometry": start() + process(GRAY, 1, 1) + process(GRAY, 6, 6) + process(NV21, 7, 7)
     + process(NV21, 64, 48, stride=60) + process(GRAY, 30, 30, stride=40)
     + process(GRAY, 30, 30, memory=0, delta=-40) + process(NV21, 20, 20, memory=0, delta=-10)

@@ -7,13 +7,33 @@
 # <dir>/.apt, so the machine's own apt configuration and installed architectures are left alone.
 # The C and C++ runtime come with the cross compiler itself (/usr/arm-linux-gnueabihf).
 # jni.h and jni_md.h are linked from the host JDK: they are portable C and only declare types.
-# Idempotent: once <dir>/.complete exists (written last) the script does nothing.
+# Idempotent: once <dir>/.complete exists (written last) nothing is fetched again; the JDK
+# headers are linked on every run (a JDK may have been installed since).
 set -euo pipefail
 
 dir="${1:-$(cd "$(dirname "$0")/.." && pwd)/build-armhf/sysroot}"
 mkdir -p "$dir"
 dir="$(cd "$dir" && pwd)"
-[ -f "$dir/.complete" ] && exit 0
+
+link_jni_headers() {
+  local javac home
+  for javac in "${JAVA_HOME:-}/bin/javac" "$(command -v javac || true)"; do
+    [ -x "$javac" ] || continue
+    home="$(dirname "$(dirname "$(readlink -f "$javac")")")"
+    if [ -f "$home/include/jni.h" ] && [ -f "$home/include/linux/jni_md.h" ]; then
+      mkdir -p "$dir/usr/include"
+      ln -sf "$home/include/jni.h" "$dir/usr/include/jni.h"
+      ln -sf "$home/include/linux/jni_md.h" "$dir/usr/include/jni_md.h"
+      return 0
+    fi
+  done
+  echo "armhf-sysroot: no JDK found, the JNI library and its tests will be skipped"
+}
+
+if [ -f "$dir/.complete" ]; then
+  link_jni_headers
+  exit 0
+fi
 
 debs=(libjpeg62-turbo libjpeg62-turbo-dev nlohmann-json3-dev)
 apt_dir="$dir/.apt"
@@ -40,22 +60,7 @@ for deb in "$apt_dir"/debs/*.deb; do
   dpkg -x "$deb" "$dir"
 done
 
-jdk_include=""
-for javac in "${JAVA_HOME:-}/bin/javac" "$(command -v javac || true)"; do
-  [ -x "$javac" ] || continue
-  home="$(dirname "$(dirname "$(readlink -f "$javac")")")"
-  if [ -f "$home/include/jni.h" ] && [ -f "$home/include/linux/jni_md.h" ]; then
-    jdk_include="$home/include"
-    break
-  fi
-done
-if [ -n "$jdk_include" ]; then
-  mkdir -p "$dir/usr/include"
-  ln -sf "$jdk_include/jni.h" "$dir/usr/include/jni.h"
-  ln -sf "$jdk_include/linux/jni_md.h" "$dir/usr/include/jni_md.h"
-else
-  echo "armhf-sysroot: no JDK found, the JNI library and its tests will be skipped"
-fi
+link_jni_headers
 
 # jpeglib.h includes jconfig.h, which Debian keeps in the multiarch folder: make it visible
 # beside jpeglib.h so the plain include folder is all a compiler needs.

@@ -12,18 +12,28 @@ scripts/install-deps.sh
 scripts/armhf-sysroot.sh build-armhf/sysroot
 deps="$PWD/build-armhf/sysroot"
 
+# The NDK's sysroot has jni.h (and the C library); libjpeg and nlohmann-json are the app
+# developer's, in folders of their own, laid out as README.md shows. The armhf packages stand in
+# for a libjpeg-turbo built with the NDK.
 dir=build-android
 ndk_sysroot="$PWD/$dir/ndk-sysroot"
-mkdir -p "$ndk_sysroot/usr/include"
+jpeg="$PWD/$dir/jpeg-armeabi-v7a"
+json="$PWD/$dir/json"
+mkdir -p "$ndk_sysroot/usr/include" "$jpeg/include" "$jpeg/lib" "$json/include"
 for h in jni.h jni_md.h; do
   [ -e "$deps/usr/include/$h" ] && ln -sf "$(readlink -f "$deps/usr/include/$h")" "$ndk_sysroot/usr/include/$h"
 done
+for h in jpeglib.h jconfig.h jmorecfg.h jerror.h; do
+  ln -sf "$(readlink -f "$deps/usr/include/$h")" "$jpeg/include/$h"
+done
+ln -sf "$deps/usr/lib/arm-linux-gnueabihf/libjpeg.so" "$jpeg/lib/libjpeg.so"
+ln -sfn "$deps/usr/include/nlohmann" "$json/include/nlohmann"
 
 jobs=$(nproc 2>/dev/null || echo 2)
 cmake -S . -B "$dir" -G Ninja -DCMAKE_TOOLCHAIN_FILE="$PWD/cmake/toolchains/android-emulated.cmake" \
   -DORZAVS_ANDROID_SYSROOT="$ndk_sysroot" -DCMAKE_BUILD_TYPE=Release -DORZAVS_WERROR=ON \
-  -DJPEG_INCLUDE_DIR="$deps/usr/include" -DJPEG_LIBRARY="$deps/usr/lib/arm-linux-gnueabihf/libjpeg.so" \
-  -Dnlohmann_json_DIR="$deps/usr/share/cmake/nlohmann_json" >"$dir/configure.log" \
+  -DJPEG_INCLUDE_DIR="$jpeg/include" -DJPEG_LIBRARY="$jpeg/lib/libjpeg.so" \
+  -DORZAVS_NLOHMANN_INCLUDE="$json/include" >"$dir/configure.log" \
   || { cat "$dir/configure.log"; exit 1; }
 cmake --build "$dir" -j "$jobs"
 

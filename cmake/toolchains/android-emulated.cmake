@@ -28,17 +28,19 @@ set(CMAKE_CXX_COMPILER_TARGET arm-linux-gnueabihf)
 
 # The NDK's compile flags for armeabi-v7a with NEON, and the macros its compiler predefines.
 set(ORZAVS_NDK_FLAGS "-DANDROID -D__ANDROID__ -D__ANDROID_API__=21 -fdata-sections -ffunction-sections -funwind-tables -fstack-protector-strong -no-canonical-prefixes -march=armv7-a -mthumb -mfpu=neon -Wformat -Werror=format-security")
-set(CMAKE_C_FLAGS_INIT "${ORZAVS_NDK_FLAGS}")
-set(CMAKE_CXX_FLAGS_INIT "${ORZAVS_NDK_FLAGS}")
-set(CMAKE_SHARED_LINKER_FLAGS_INIT "-Wl,--build-id=sha1 -Wl,--no-undefined -Wl,--fatal-warnings -Wl,--gc-sections")
-set(CMAKE_POSITION_INDEPENDENT_CODE ON)
 
-# The NDK's sysroot: jni.h and the C library, nothing else. ORZAVS_ANDROID_SYSROOT is made by
-# scripts/check-android.sh.
+# The NDK's sysroot: jni.h and the C library, nothing else; its compiler searches it by itself.
+# ORZAVS_ANDROID_SYSROOT is made by scripts/check-android.sh.
 if(NOT ORZAVS_ANDROID_SYSROOT)
   set(ORZAVS_ANDROID_SYSROOT "${CMAKE_BINARY_DIR}/ndk-sysroot" CACHE PATH "Emulated NDK sysroot")
 endif()
 list(APPEND CMAKE_TRY_COMPILE_PLATFORM_VARIABLES ORZAVS_ANDROID_SYSROOT)
+string(APPEND ORZAVS_NDK_FLAGS " -idirafter ${ORZAVS_ANDROID_SYSROOT}/usr/include")
+
+set(CMAKE_C_FLAGS_INIT "${ORZAVS_NDK_FLAGS}")
+set(CMAKE_CXX_FLAGS_INIT "${ORZAVS_NDK_FLAGS}")
+set(CMAKE_SHARED_LINKER_FLAGS_INIT "-Wl,--build-id=sha1 -Wl,--no-undefined -Wl,--fatal-warnings -Wl,--gc-sections")
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
 set(CMAKE_FIND_ROOT_PATH "${ORZAVS_ANDROID_SYSROOT}")
 set(CMAKE_FIND_ROOT_PATH_MODE_PROGRAM NEVER)
 set(CMAKE_FIND_ROOT_PATH_MODE_LIBRARY ONLY)

@@ -68,8 +68,12 @@ set(ENV{PKG_CONFIG_LIBDIR}
     "${ORZAVS_ARMHF_SYSROOT}/usr/lib/${ORZAVS_ARMHF_TRIPLE}/pkgconfig:${ORZAVS_ARMHF_SYSROOT}/usr/share/pkgconfig")
 unset(ENV{PKG_CONFIG_PATH})
 
-# CTest (and add_custom_command on built executables) run ARM programs through qemu-arm, with
-# the cross runtime as the dynamic loader's root and the sysroot's libjpeg on the library path.
+# GoogleTest is built from /usr/src/googletest with the cross compiler: the host's libraries are
+# x86-64.
+set(ORZAVS_GTEST_FROM_SOURCE ON CACHE BOOL "Build GoogleTest from /usr/src/googletest (cross builds)")
+
+# CTest runs the ARM test programs through qemu-arm, with the cross runtime as the dynamic
+# loader's root and the sysroot's libjpeg on the library path.
 find_program(ORZAVS_QEMU_ARM qemu-arm)
 if(ORZAVS_QEMU_ARM)
   set(CMAKE_CROSSCOMPILING_EMULATOR

@@ -17,17 +17,21 @@ execute_process(
           -Dorzavs.library.path=${LIBRARY} -cp ${CLASSPATH}
           com.orza.vs.tools.soak.Soak --seconds ${SECONDS}
   RESULT_VARIABLE status
-  OUTPUT_VARIABLE output
-  ERROR_VARIABLE output)
-file(WRITE ${LOG} "${output}")
+  OUTPUT_VARIABLE out
+  ERROR_VARIABLE err)
+# The library's own lines are on standard output, the soak's report on standard error.
+file(WRITE ${LOG} "--- standard output\n${out}\n--- standard error\n${err}")
 
-string(REGEX MATCHALL "[^\n]*(soak:|WARNING|FATAL ERROR|Exception)[^\n]*" lines "${output}")
+set(all "${out}\n${err}")
+string(REPLACE ";" "<semicolon>" all "${all}")
+string(REGEX MATCHALL "[^\n]*(soak:|WARNING|FATAL ERROR|Exception)[^\n]*" lines "${all}")
 foreach(line IN LISTS lines)
+  string(REPLACE "<semicolon>" ";" line "${line}")
   message("${line}")
 endforeach()
 message("RunSoak: full output in ${LOG}")
 
-if(output MATCHES "WARNING in native method|JNI local refs|FATAL ERROR in native method")
+if(all MATCHES "WARNING in native method|JNI local refs|FATAL ERROR in native method")
   message(FATAL_ERROR "RunSoak: the JVM reported JNI misuse (see above)")
 endif()
 if(NOT status EQUAL 0)

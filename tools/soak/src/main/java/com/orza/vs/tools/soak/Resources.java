@@ -69,7 +69,7 @@ final class Resources {
       bean.dumpHeap(file.getPath(), true);
       return countJniGlobalRoots(file);
     } catch (IOException | RuntimeException e) {
-      System.out.println("soak: could not count JNI global references: " + e);
+      System.err.println("soak: could not count JNI global references: " + e);
       return -1;
     } finally {
       if (file != null && file.exists() && !file.delete()) file.deleteOnExit();

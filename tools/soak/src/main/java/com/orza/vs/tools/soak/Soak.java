@@ -84,6 +84,10 @@ public final class Soak {
 
   private static final ThreadLocal<Push> CURRENT_PUSH = new ThreadLocal<>();
 
+  // The library writes its diagnostics to standard output; the report goes to standard error so
+  // that the two never interleave within a line.
+  private static final java.io.PrintStream REPORT = System.err;
+
   // Incremented around every engine reset and by every result callback: a request's wait ends
   // only through one of them.
   private final AtomicLong disturbance = new AtomicLong();
@@ -588,30 +592,30 @@ public final class Soak {
     double threadsEarly = median(early, s -> s.threads);
     double threadsLate = median(late, s -> s.threads);
 
-    System.out.printf(Locale.ROOT,
+    REPORT.printf(Locale.ROOT,
         "soak: %.0f s, %d frames (%d through lent buffers, %d described wrongly), %d still images, %d resets%n",
         seconds, counters.frames.get(), counters.lentFrames.get(), counters.badFrames.get(), counters.stills.get(),
         counters.resets.get());
-    System.out.printf(Locale.ROOT, "soak: interest points: %d callbacks, %d points%n",
+    REPORT.printf(Locale.ROOT, "soak: interest points: %d callbacks, %d points%n",
         counters.pointCallbacks.get(), counters.points.get());
     StringBuilder fates = new StringBuilder();
     for (Fate f : Fate.values()) fates.append(' ').append(f.name().toLowerCase(Locale.ROOT)).append('=').append(counters.fates.get(f.ordinal()));
-    System.out.printf(Locale.ROOT, "soak: requests sent %d; fates:%s%n", counters.sends.get(), fates);
-    System.out.printf(Locale.ROOT,
+    REPORT.printf(Locale.ROOT, "soak: requests sent %d; fates:%s%n", counters.sends.get(), fates);
+    REPORT.printf(Locale.ROOT,
         "soak: replies pushed %d (%d with the request's id); callbacks: %d didDecode, %d didReceiveServerError; "
             + "silent pushes explained by a reset or an earlier reply %d; lost %d, duplicated %d, outside a push %d, "
             + "double dispatch %d, after stop %d; %d requests left unanswered at the end%n",
         counters.pushes.get(), counters.pushesRightId.get(), counters.decodes.get(), counters.serverErrors.get(),
         counters.excusedSilent.get(), counters.lost.get(), counters.duplicated.get(), counters.unattributed.get(),
         counters.doubleDispatch.get(), counters.afterStop.get(), left.size());
-    System.out.printf(Locale.ROOT, "soak: samples %d (early window %.0f-%.0f s: %d, late window from %.0f s: %d)%n",
+    REPORT.printf(Locale.ROOT, "soak: samples %d (early window %.0f-%.0f s: %d, late window from %.0f s: %d)%n",
         samples.size(), earlyFrom, earlyTo, early.size(), lateFrom, late.size());
-    System.out.printf(Locale.ROOT, "soak: resident memory   early %.1f MB, late %.1f MB%n", rssEarly, rssLate);
-    System.out.printf(Locale.ROOT, "soak: Java heap after GC early %.1f MB, late %.1f MB%n", heapEarly, heapLate);
-    System.out.printf(Locale.ROOT, "soak: live threads      early %.0f, late %.0f%n", threadsEarly, threadsLate);
-    System.out.printf(Locale.ROOT, "soak: JNI global refs   early %d, late %d (heap dump roots)%n", globalsEarly, globalsLate);
+    REPORT.printf(Locale.ROOT, "soak: resident memory   early %.1f MB, late %.1f MB%n", rssEarly, rssLate);
+    REPORT.printf(Locale.ROOT, "soak: Java heap after GC early %.1f MB, late %.1f MB%n", heapEarly, heapLate);
+    REPORT.printf(Locale.ROOT, "soak: live threads      early %.0f, late %.0f%n", threadsEarly, threadsLate);
+    REPORT.printf(Locale.ROOT, "soak: JNI global refs   early %d, late %d (heap dump roots)%n", globalsEarly, globalsLate);
     String nmt = Resources.nativeMemoryTotal();
-    if (nmt != null) System.out.println("soak: JVM native memory (NMT) at the end: " + nmt);
+    if (nmt != null) REPORT.println("soak: JVM native memory (NMT) at the end: " + nmt);
 
     if (early.isEmpty() || late.isEmpty()) fail("too few samples to compare early and late");
     if (rssLate - rssEarly > Math.max(16.0, 0.15 * rssEarly)) {
@@ -627,10 +631,10 @@ public final class Soak {
       fail("the run exercised too little: " + counters.frames.get() + " frames, " + counters.sends.get() + " requests");
     }
     if (failures.isEmpty()) {
-      System.out.println("soak: PASS");
+      REPORT.println("soak: PASS");
       return 0;
     }
-    for (String f : failures) System.out.println("soak: FAIL: " + f);
+    for (String f : failures) REPORT.println("soak: FAIL: " + f);
     return 1;
   }
 
@@ -648,7 +652,7 @@ public final class Soak {
     try {
       status = new Soak().run(seconds);
     } catch (IOException e) {
-      System.out.println("soak: FAIL: " + e);
+      REPORT.println("soak: FAIL: " + e);
       status = 1;
     }
     System.exit(status);

@@ -1,5 +1,5 @@
-// The FAST step over arbitrary planes and geometry. The plane ends at an unreadable page, so no
-// read past it goes unnoticed. Every result is compared with a plain reference written from the
+// The FAST step over arbitrary planes and geometry. The plane sits between poisoned memory and
+// an unreadable page (see GuardedBlock), so no read outside it goes unnoticed. Every result is compared with a plain reference written from the
 // definition (segment test, binary-search score, 8-neighbour suppression with >=), the vector
 // kernel with the scalar one, and the engine's interest-point step with the best-50 rule.
 

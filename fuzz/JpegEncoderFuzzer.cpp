@@ -1,7 +1,8 @@
 // Both JPEG encoders over arbitrary geometry, strides, formats, channel counts and qualities.
 // The input's first bytes choose the geometry, the rest are the pixels. Each frame sits in a
-// block exactly as large as the encoder's contract asks for, ending at an unreadable page, so
-// a read past it faults even inside the (uninstrumented) JPEG library. Every stream produced is
+// block exactly as large as the encoder's contract asks for, either ending at an unreadable page
+// (a read past it faults even inside the uninstrumented JPEG library) or 8-byte aligned with
+// poisoned surroundings (any stray read by instrumented code is reported). Every stream produced is
 // decoded again and checked; equivalent frames (NV21 and NV12 with swapped chroma, padded and
 // unpadded packed rows, any YUV stride, BGR and RGB) must give identical bytes.
 
@@ -142,7 +143,8 @@ void fuzzYuv(FuzzedDataProvider& in) {
     std::printf("yuv: %dx%d stride %d format %d quality %d\n", width, height, stride,
                 static_cast<int>(format), quality);
   }
-  GuardedBlock frame(static_cast<size_t>(bytes));
+  const GuardedBlock::Placement placement = in.ConsumeBool() ? GuardedBlock::Aligned : GuardedBlock::EndAtPage;
+  GuardedBlock frame(static_cast<size_t>(bytes), placement);
   const std::vector<uint8_t> pixels = in.ConsumeRemainingBytes<uint8_t>();
   frame.fill(pixels.data(), pixels.size());
 
@@ -162,7 +164,7 @@ void fuzzYuv(FuzzedDataProvider& in) {
 
   if (format != OrzaVSMobile::I420) {
     // The same frame in the other semi-planar layout: every chroma pair swapped.
-    GuardedBlock swapped(static_cast<size_t>(bytes));
+    GuardedBlock swapped(static_cast<size_t>(bytes), placement);
     std::memcpy(swapped.data(), frame.data(), static_cast<size_t>(bytes));
     const size_t luma = static_cast<size_t>(width) * static_cast<size_t>(height);
     for (size_t i = luma; i + 1 < static_cast<size_t>(bytes); i += 2) {
@@ -201,7 +203,8 @@ void fuzzPacked(FuzzedDataProvider& in) {
     std::printf("packed: %dx%d stride %d channels %d format %d quality %d\n", width, height,
                 stride, numChannels, static_cast<int>(format), quality);
   }
-  GuardedBlock frame(static_cast<size_t>(bytes));
+  const GuardedBlock::Placement placement = in.ConsumeBool() ? GuardedBlock::Aligned : GuardedBlock::EndAtPage;
+  GuardedBlock frame(static_cast<size_t>(bytes), placement);
   const std::vector<uint8_t> pixels = in.ConsumeRemainingBytes<uint8_t>();
   frame.fill(pixels.data(), pixels.size());
 
@@ -219,7 +222,7 @@ void fuzzPacked(FuzzedDataProvider& in) {
   // The same rows without padding encode identically.
   if (stride >= rowBytes && height > 1) {
     const size_t row = static_cast<size_t>(rowBytes);
-    GuardedBlock tight(row * static_cast<size_t>(height));
+    GuardedBlock tight(row * static_cast<size_t>(height), placement);
     for (int32_t r = 0; r < height; ++r) {
       std::memcpy(tight.data() + static_cast<size_t>(r) * row,
                   frame.data() + static_cast<size_t>(r) * static_cast<size_t>(stride), row);
@@ -232,7 +235,7 @@ void fuzzPacked(FuzzedDataProvider& in) {
 
   // B,G,R rows give the same stream as the R,G,B rows they stand for.
   if (numChannels == 3 && format != OrzaVSMobile::RGB && stride >= rowBytes) {
-    GuardedBlock rgb(static_cast<size_t>(bytes));
+    GuardedBlock rgb(static_cast<size_t>(bytes), placement);
     std::memcpy(rgb.data(), frame.data(), static_cast<size_t>(bytes));
     for (int32_t r = 0; r < height; ++r) {
       uint8_t* p = rgb.data() + static_cast<size_t>(r) * static_cast<size_t>(stride);

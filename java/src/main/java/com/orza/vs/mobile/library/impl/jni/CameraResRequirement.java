@@ -1,21 +1,13 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /** The camera resolution the engine asks for, in pixel rows. */
-public class CameraResRequirement {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class CameraResRequirement extends NativeObject {
   public CameraResRequirement(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   CameraResRequirement(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(CameraResRequirement obj) {
@@ -23,20 +15,8 @@ public class CameraResRequirement {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_CameraResRequirement(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_CameraResRequirement(cPtr);
   }
 
   public CameraResRequirement() {

@@ -4,21 +4,13 @@ package com.orza.vs.mobile.library.impl.jni;
  * Side data of one frame. {@code timeStamp} is the capture time in seconds (-1.0 when
  * unknown); the engine chooses frames by it.
  */
-public class ExtraFrameData {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class ExtraFrameData extends NativeObject {
   public ExtraFrameData(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   ExtraFrameData(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(ExtraFrameData obj) {
@@ -26,20 +18,8 @@ public class ExtraFrameData {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_ExtraFrameData(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_ExtraFrameData(cPtr);
   }
 
   public ExtraFrameData() {

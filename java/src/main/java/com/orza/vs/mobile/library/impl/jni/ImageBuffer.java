@@ -7,21 +7,13 @@ package com.orza.vs.mobile.library.impl.jni;
  * raised, and pointing {@code data} elsewhere makes the buffer borrow that memory
  * ({@code allocLen} 0), so that no fill can write outside memory the buffer was given.
  */
-public class ImageBuffer {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class ImageBuffer extends NativeObject {
   public ImageBuffer(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   ImageBuffer(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(ImageBuffer obj) {
@@ -29,20 +21,8 @@ public class ImageBuffer {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_ImageBuffer(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_ImageBuffer(cPtr);
   }
 
   public ImageBuffer() {

@@ -4,21 +4,13 @@ package com.orza.vs.mobile.library.impl.jni;
  * An ordered map from string to double. A missing key in {@link #get} or {@link #del} raises IndexOutOfBoundsException
  * "key not found"; a null key raises NullPointerException "null string".
  */
-public class MapOfStringToDouble {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class MapOfStringToDouble extends NativeObject {
   public MapOfStringToDouble(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   MapOfStringToDouble(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(MapOfStringToDouble obj) {
@@ -26,20 +18,8 @@ public class MapOfStringToDouble {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_MapOfStringToDouble(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_MapOfStringToDouble(cPtr);
   }
 
   public MapOfStringToDouble() {

@@ -5,21 +5,13 @@ package com.orza.vs.mobile.library.impl.jni;
  * a value set from Java is taken modulo 2^32). A missing key in {@link #get} or {@link #del} raises IndexOutOfBoundsException
  * "key not found"; a null key raises NullPointerException "null string".
  */
-public class MapOfStringToUInt {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class MapOfStringToUInt extends NativeObject {
   public MapOfStringToUInt(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   MapOfStringToUInt(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(MapOfStringToUInt obj) {
@@ -27,20 +19,8 @@ public class MapOfStringToUInt {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_MapOfStringToUInt(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_MapOfStringToUInt(cPtr);
   }
 
   public MapOfStringToUInt() {

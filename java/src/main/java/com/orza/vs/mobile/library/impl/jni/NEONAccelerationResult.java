@@ -1,21 +1,13 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /** The outcome of a NEON self test (inert in this library). */
-public class NEONAccelerationResult {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class NEONAccelerationResult extends NativeObject {
   public NEONAccelerationResult(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   NEONAccelerationResult(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(NEONAccelerationResult obj) {
@@ -23,20 +15,8 @@ public class NEONAccelerationResult {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_NEONAccelerationResult(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_NEONAccelerationResult(cPtr);
   }
 
   public NEONAccelerationResult() {

@@ -4,21 +4,13 @@ package com.orza.vs.mobile.library.impl.jni;
  * One detected or decoded object. {@code subContents} nests objects of the same type;
  * {@code location} is its outline in frame pixels.
  */
-public class ObjectInfo {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class ObjectInfo extends NativeObject {
   public ObjectInfo(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   ObjectInfo(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(ObjectInfo obj) {
@@ -26,20 +18,8 @@ public class ObjectInfo {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_ObjectInfo(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_ObjectInfo(cPtr);
   }
 
   public ObjectInfo(ContentType contentType) {

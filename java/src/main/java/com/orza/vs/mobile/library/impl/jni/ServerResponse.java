@@ -4,21 +4,13 @@ package com.orza.vs.mobile.library.impl.jni;
  * The transport's answer to one {@link ServerRequest}: the same {@code id}, the transport's
  * status code (200 for success), the body, and the measured round trip.
  */
-public class ServerResponse {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class ServerResponse extends NativeObject {
   public ServerResponse(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
   ServerResponse(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+    super(cPtr, parent);
   }
 
   public static long getCPtr(ServerResponse obj) {
@@ -26,20 +18,8 @@ public class ServerResponse {
   }
 
   @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_ServerResponse(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  protected void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_ServerResponse(cPtr);
   }
 
   public ServerResponse() {

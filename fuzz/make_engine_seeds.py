@@ -12,6 +12,9 @@ OUT = os.path.join(os.path.dirname(os.path.abspath(__file__)), "corpus", "engine
 
 I420, NV21, NV12, RGB, BGR, BGRA, BGRX, GRAY = range(8)
 NOISE, FLAT, SPOTS, BLOCKS = range(4)
+# Memory of a frame: allocated through the buffer, none, or borrowed (ending at an unreadable
+# page, or 8-byte aligned so that a read just before the start is caught).
+ALLOCATED, NO_MEMORY, AT_PAGE_END, ALIGNED = 0, 1, 2, 4
 
 
 def exact(value):
@@ -22,7 +25,7 @@ def description(fmt, width, height, channels, stride):
     return exact(fmt) + exact(width) + exact(height) + bytes([channels + 1]) + exact(stride)
 
 
-def frame(fmt, width, height, channels=1, stride=None, memory=2, delta=0, pixels=BLOCKS, seed=7):
+def frame(fmt, width, height, channels=1, stride=None, memory=AT_PAGE_END, delta=0, pixels=BLOCKS, seed=7):
     if stride is None:
         stride = width * max(channels, 1)
     return (description(fmt, width, height, channels, stride) + bytes([memory, delta + 64, pixels])
@@ -117,12 +120,13 @@ SEEDS = {
     # Tiny frames while a frame is held: the sharpness margins shrink to 0 and its samples meet
     # the plane's edges.
     "tiny_frames_while_held": start() + process(NV21, 64, 48) + WAIT + process(NV21, 64, 48, step_ms=150)
-    + b"".join(process(GRAY, w, h, pixels=NOISE, step_ms=20) for w, h in
-               ((1, 1), (2, 2), (3, 3), (20, 4), (4, 20), (24, 5), (25, 5), (15, 15), (16, 6), (5, 64)))
+    + b"".join(process(GRAY, w, h, pixels=NOISE, step_ms=20, memory=memory) for w, h in
+               ((1, 1), (2, 2), (3, 3), (20, 4), (4, 20), (24, 5), (25, 5), (15, 15), (16, 6), (5, 64))
+               for memory in (ALIGNED, AT_PAGE_END))
     + push() + stop(),
     "odd_geometry": start() + process(GRAY, 1, 1) + process(GRAY, 6, 6) + process(NV21, 7, 7)
     + process(NV21, 64, 48, stride=60) + process(GRAY, 30, 30, stride=40)
-    + process(GRAY, 30, 30, memory=0, delta=-40) + process(NV21, 20, 20, memory=0, delta=-10)
+    + process(GRAY, 30, 30, memory=ALLOCATED, delta=-40) + process(NV21, 20, 20, memory=ALLOCATED, delta=-10)
     + process(RGB, 20, 20, channels=3) + process(99, 20, 20) + process(-1, 20, 20)
     + single(GRAY, 20, 20, channels=3) + single(NV21, 20, 20, stride=8) + stop(),
 }

@@ -290,6 +290,11 @@ bool SwigDirector_ServerDelegate::upcall(int upcallIndex, const char* operation,
   if (jthrowable thrown = env->ExceptionOccurred()) {
     env->ExceptionClear();
     Swig::DirectorException exception(env, thrown);
+    // The engine catches this and gives the frame up, so the Java side would never see it: the
+    // Java caller on this thread gets the same object when its call returns (nothing extra
+    // when the exception reaches it directly), or, on the worker, the callback handler does.
+    const std::string where = qualified(kServerScope, operation);
+    orzavs::jni::parkException(env, thrown, where.c_str());
     env->DeleteLocalRef(thrown);
     throw exception;
   }

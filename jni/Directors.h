@@ -14,8 +14,8 @@
 // while a reply is being settled), so an exception unwinding from an event callback would leave
 // that work undone. The event director is therefore the boundary: a Java exception from an
 // event override is parked in the current call from Java and rethrown there when that call
-// returns (process(), pushServerResponse(), or a direct call of the delegate), or printed and
-// dropped on a native thread. The engine's sends, by contrast, are built to fail: the visual
+// returns (process(), pushServerResponse(), or a direct call of the delegate) as the very same
+// Java object, or handed to the application's callback exception handler on a native thread. The engine's sends, by contrast, are built to fail: the visual
 // search job catches what sendServerRequest throws and gives the frame up, so the server
 // director throws Swig::DirectorException to its native caller as a director does; when the
 // caller is an exported function, the exception goes back into Java.

@@ -1,5 +1,6 @@
 #include "jni/JniCall.h"
 
+#include <atomic>
 #include <cstdio>
 #include <new>
 #include <stdexcept>
@@ -20,56 +21,95 @@ CallFrame::CallFrame(JNIEnv* env) noexcept : env_(env), outer_(tInnermostFrame) 
   tInnermostFrame = this;
 }
 
+namespace {
+
+// One line naming a Java exception that cannot be handed to Java code.
+void printException(JNIEnv* env, const char* prefix, jthrowable throwable) noexcept {
+  try {
+    Swig::DirectorException described(env, throwable);
+    std::printf("%s: %s: %s\n", prefix, described.classname(), described.what());
+  } catch (...) {
+    std::printf("%s\n", prefix);
+  }
+}
+
+std::atomic<jmethodID> gReportUncaught{nullptr};
+
+// Hands an exception that no Java caller can receive to the Java side's handler; false when
+// that handler cannot be reached (the module is not initialised, or the call failed).
+bool reportUncaught(JNIEnv* env, jthrowable throwable) noexcept {
+  jclass module = Swig::moduleClass();
+  if (module == nullptr) return false;
+  jmethodID report = gReportUncaught.load(std::memory_order_acquire);
+  if (report == nullptr) {
+    report = env->GetStaticMethodID(module, "reportUncaughtCallbackException",
+                                    "(Ljava/lang/Throwable;)V");
+    if (report == nullptr) {
+      env->ExceptionClear();
+      return false;
+    }
+    gReportUncaught.store(report, std::memory_order_release);
+  }
+  env->CallStaticVoidMethod(module, report, throwable);
+  if (!env->ExceptionCheck()) return true;
+  env->ExceptionClear();
+  return false;
+}
+
+}  // namespace
+
 CallFrame::~CallFrame() {
   tInnermostFrame = outer_;
-  if (!parked_) return;
+  if (parked_ == nullptr) return;
   if (env_->ExceptionCheck()) {
-    // The function's own exception is what Java sees; say what was dropped for it.
-    std::printf("Dropped Java exception from a callback: %s: %s\n", className_.c_str(),
-                message_.c_str());
-    return;
+    jthrowable own = env_->ExceptionOccurred();
+    env_->ExceptionClear();
+    // The function's own exception is what Java sees (often the parked one itself, carried
+    // out as a DirectorException); otherwise say what was dropped for it.
+    if (!env_->IsSameObject(own, parked_)) {
+      printException(env_, "Dropped Java exception from a callback", parked_);
+    }
+    env_->Throw(own);
+    env_->DeleteLocalRef(own);
+  } else {
+    env_->Throw(parked_);
   }
-  Swig::DirectorException(className_.c_str(), message_.c_str()).raiseJavaException(env_);
+  env_->DeleteGlobalRef(parked_);
 }
 
 CallFrame* CallFrame::current() noexcept { return tInnermostFrame; }
 
-void CallFrame::park(const char* className, const char* message) {
-  if (parked_) return;  // the first exception wins
-  className_ = className;
-  message_ = message;
-  parked_ = true;
+void CallFrame::park(JNIEnv* env, jthrowable throwable) noexcept {
+  if (parked_ != nullptr || throwable == nullptr) return;  // the first exception wins
+  parked_ = static_cast<jthrowable>(env->NewGlobalRef(throwable));
+  if (parked_ == nullptr) {
+    env->ExceptionClear();
+    printException(env, "Dropped Java exception from a callback (out of memory)", throwable);
+  }
 }
 
-void parkException(const char* className, const char* message, const char* where) noexcept {
-  CallFrame* frame = CallFrame::current();
-  if (frame != nullptr) {
-    try {
-      frame->park(className, message);
-      return;
-    } catch (...) {
-      // Out of memory while keeping it: fall through and print it instead.
-    }
+void parkException(JNIEnv* env, jthrowable throwable, const char* where) noexcept {
+  if (throwable == nullptr) return;
+  if (CallFrame* frame = CallFrame::current()) {
+    frame->park(env, throwable);
+    return;
   }
-  // No call from Java is in progress on this thread (an engine worker): nobody can receive it,
-  // and letting it unwind would end the process or leave the engine mid-operation. It is
-  // reported on standard output instead.
-  std::printf("Dropped Java exception from %s (no Java caller on this thread): %s: %s\n", where,
-              className, message);
+  // No call from Java is in progress on this thread (an engine worker). Letting the exception
+  // unwind would end the process or leave the engine mid-operation; the application's handler
+  // gets it instead.
+  if (reportUncaught(env, throwable)) return;
+  char prefix[256];
+  std::snprintf(prefix, sizeof prefix, "Uncaught Java exception from %s (no Java caller on this thread)",
+                where);
+  printException(env, prefix, throwable);
 }
 
 void parkPendingException(JNIEnv* env, const char* where) noexcept {
   if (!env->ExceptionCheck()) return;
   jthrowable throwable = env->ExceptionOccurred();
   env->ExceptionClear();
-  try {
-    Swig::DirectorException exception(env, throwable);
-    env->DeleteLocalRef(throwable);
-    parkException(exception.classname(), exception.what(), where);
-  } catch (...) {
-    env->DeleteLocalRef(throwable);
-    std::printf("Dropped Java exception from %s\n", where);
-  }
+  parkException(env, throwable, where);
+  env->DeleteLocalRef(throwable);
 }
 
 // ---------------------------------------------------------------------------------------------

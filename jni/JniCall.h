@@ -28,9 +28,11 @@ struct JavaPending {};
 [[noreturn]] void raise(int code, std::string message);
 
 // One native method call from Java on this thread. Exceptions that Java callbacks raise while
-// it runs, and that must not unwind through engine code, are parked here and thrown into Java
-// when the call returns (the first one wins; an exception the function itself raised is kept).
-// Frames nest when a callback calls back into the library.
+// it runs, and that must not unwind through engine code, are parked here (as a global reference
+// to the exception object itself) and thrown into Java again when the call returns, so the Java
+// caller catches the very object the callback threw. The first one wins; an exception that the
+// function itself raised is kept, unless it is that same object. Frames nest when a callback
+// calls back into the library.
 class CallFrame {
  public:
   explicit CallFrame(JNIEnv* env) noexcept;
@@ -41,21 +43,23 @@ class CallFrame {
   // The innermost frame of this thread; null on a thread that Java did not call into (an
   // engine worker).
   static CallFrame* current() noexcept;
-  void park(const char* className, const char* message);
+  // Keeps `throwable` (a local or global reference; no exception may be pending).
+  void park(JNIEnv* env, jthrowable throwable) noexcept;
 
  private:
   JNIEnv* env_;
   CallFrame* outer_;
-  bool parked_ = false;
-  std::string className_;
-  std::string message_;
+  jthrowable parked_ = nullptr;  // a global reference
 };
 
-// Moves a Java exception that is pending on `env` into the current call frame, or, on a
-// thread without one, prints it and drops it; `where` names the operation for that line.
-// Nothing happens when no exception is pending.
+// Moves a Java exception that is pending on `env` into the current call frame. On a thread
+// without one (no Java caller can receive it) it goes to the application's handler for
+// callback exceptions (OrzaVSMobileJNI.reportUncaughtCallbackException), or, when that cannot
+// be reached, to one line on standard output naming `where`. Nothing happens when no exception
+// is pending; none is pending afterwards.
 void parkPendingException(JNIEnv* env, const char* where) noexcept;
-void parkException(const char* className, const char* message, const char* where) noexcept;
+// The same for an exception that is not pending.
+void parkException(JNIEnv* env, jthrowable throwable, const char* where) noexcept;
 
 // Maps the exception being handled to a Java exception. Call only from a catch block.
 void translateCurrentException(JNIEnv* env) noexcept;

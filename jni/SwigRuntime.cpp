@@ -268,7 +268,42 @@ bool callStringMethod(JNIEnv* env, jobject object, const char* name, std::string
 
 }  // namespace
 
-DirectorException::DirectorException(JNIEnv* env, jthrowable throwable) {
+namespace {
+
+struct GlobalRefDeleter {
+  JavaVM* vm;
+  void operator()(jobject ref) const noexcept {
+    void* current = nullptr;
+    const jint status = vm->GetEnv(&current, JNI_VERSION_1_2);
+    JNIEnv* env = static_cast<JNIEnv*>(current);
+    if (status == JNI_EDETACHED) {
+      if (attachCurrentThread(vm, &env, &JavaVM::AttachCurrentThread) != JNI_OK) return;
+    } else if (status != JNI_OK) {
+      return;
+    }
+    env->DeleteGlobalRef(ref);
+    if (status == JNI_EDETACHED) vm->DetachCurrentThread();
+  }
+};
+
+}  // namespace
+
+std::shared_ptr<_jobject> makeSharedGlobalRef(JNIEnv* env, jobject object) {
+  if (object == nullptr) return nullptr;
+  JavaVM* vm = nullptr;
+  if (env->GetJavaVM(&vm) != JNI_OK || vm == nullptr) return nullptr;
+  jobject global = env->NewGlobalRef(object);
+  if (global == nullptr) return nullptr;
+  try {
+    return std::shared_ptr<_jobject>(global, GlobalRefDeleter{vm});
+  } catch (...) {
+    env->DeleteGlobalRef(global);  // out of memory for the count: the class and message remain
+    return nullptr;
+  }
+}
+
+DirectorException::DirectorException(JNIEnv* env, jthrowable throwable)
+    : throwable_(makeSharedGlobalRef(env, throwable)) {
   if (throwable != nullptr) {
     jclass cls = env->GetObjectClass(throwable);
     if (cls != nullptr) {
@@ -291,6 +326,7 @@ DirectorException::DirectorException(const char* className, const char* message)
 
 void DirectorException::raiseJavaException(JNIEnv* env) const noexcept {
   env->ExceptionClear();
+  if (throwable_ != nullptr && env->Throw(throwable()) == JNI_OK) return;
   jclass cls = className_.empty() ? nullptr : env->FindClass(className_.c_str());
   if (cls == nullptr) {
     env->ExceptionClear();

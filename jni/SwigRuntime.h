@@ -6,6 +6,7 @@
 #include <atomic>
 #include <cstddef>
 #include <exception>
+#include <memory>
 #include <string>
 
 // The runtime that lets Java classes implement the library's callback interfaces (directors),
@@ -173,18 +174,29 @@ class JNIEnvWrapper {
 // with "/" separators and its message.
 class DirectorException : public std::exception {
  public:
+  // Also keeps a global reference to `throwable` itself, so that Java can get the very object
+  // back (class, message, cause, stack trace and fields intact).
   DirectorException(JNIEnv* env, jthrowable throwable);
   DirectorException(const char* className, const char* message);
   const char* what() const noexcept override { return message_.c_str(); }
   const char* classname() const noexcept { return className_.c_str(); }
-  // Throws the described exception in Java (RuntimeException when its class cannot be found
-  // or built from a message).
+  // The original Java exception (a global reference), or null when it is not known.
+  jthrowable throwable() const noexcept { return static_cast<jthrowable>(throwable_.get()); }
+  // Throws the original exception in Java again; without one, a new exception of the described
+  // class (RuntimeException when the class cannot be found or built from a message).
   void raiseJavaException(JNIEnv* env) const noexcept;
 
  private:
   std::string className_;
   std::string message_;
+  // Shared by the copies that C++ makes of a thrown exception; the last one deletes the global
+  // reference, attaching its thread for that if the thread is not attached.
+  std::shared_ptr<_jobject> throwable_;
 };
+
+// A new global reference to `object`, deleted when the last owner lets it go (on any thread);
+// empty for a null object or when the reference cannot be made.
+std::shared_ptr<_jobject> makeSharedGlobalRef(JNIEnv* env, jobject object);
 
 // One operation that Java may override: its name and Java signature.
 struct DirectorMethod {

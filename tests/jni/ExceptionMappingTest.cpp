@@ -11,14 +11,11 @@
 #include <vector>
 
 #include "jni/JniCall.h"
-#include "support/StdoutCapture.h"
 
 namespace {
 
-using orzavs::jni::CallFrame;
 using orzavs::jni::guarded;
 using orzavs::jni::JavaError;
-using orzavs::jni::parkException;
 
 // A JNIEnv whose functions record what the binding asks of the VM. Classes are stand-in
 // handles; "java/lang/NullPointerException" and friends are found, any other name is not
@@ -143,60 +140,8 @@ TEST(GuardedCall, MapsNativeExceptionsToJavaOnesAndReturnsZero) {
   EXPECT_FALSE(vm.pending);
 }
 
-TEST(CallFrame, AParkedExceptionIsThrownWhenTheCallReturns) {
-  FakeVm vm;
-  vm.knownClasses = {"com/example/AppError"};
-  guarded(&vm.env, [&] {
-    EXPECT_NE(CallFrame::current(), nullptr);
-    parkException("com/example/AppError", "first", "Tovra::EventDelegateBase::didDecode");
-    parkException("java/lang/IllegalStateException", "second", "Tovra::EventDelegateBase::didDecode");
-    EXPECT_FALSE(vm.pending);  // nothing is pending while native code goes on
-  });
-  EXPECT_EQ(CallFrame::current(), nullptr);
-  EXPECT_TRUE(vm.pending);
-  EXPECT_EQ(vm.thrownClass, "com/example/AppError");  // the first one wins
-  EXPECT_EQ(vm.thrownMessage, "first");
-}
-
-TEST(CallFrame, FramesNestAndEachReturnsItsOwnException) {
-  FakeVm vm;
-  guarded(&vm.env, [&] {
-    CallFrame* outer = CallFrame::current();
-    guarded(&vm.env, [&] {
-      EXPECT_NE(CallFrame::current(), outer);
-      parkException("java/lang/IllegalStateException", "inner", "op");
-    });
-    EXPECT_EQ(CallFrame::current(), outer);
-    EXPECT_EQ(vm.thrownMessage, "inner");
-    vm.pending = false;  // the Java code between the two calls handled it
-  });
-  EXPECT_FALSE(vm.pending);
-}
-
-TEST(CallFrame, TheFunctionsOwnExceptionWinsOverAParkedOne) {
-  FakeVm vm;
-  orzavs_test::StdoutCapture capture;
-  guarded(&vm.env, [&] {
-    parkException("java/lang/IllegalStateException", "parked", "op");
-    throw std::out_of_range("key not found");
-  });
-  const std::string out = capture.text();
-  EXPECT_EQ(vm.thrownClass, "java/lang/IndexOutOfBoundsException");
-  EXPECT_EQ(vm.thrownMessage, "key not found");
-  EXPECT_NE(out.find("Dropped Java exception from a callback: java/lang/IllegalStateException: parked"),
-            std::string::npos);
-}
-
-TEST(CallFrame, WithoutAJavaCallerTheExceptionIsReportedAndDropped) {
-  FakeVm vm;
-  orzavs_test::StdoutCapture capture;
-  parkException("java/lang/IllegalStateException", "lost", "Tovra::EventDelegateBase::didDecode");
-  EXPECT_EQ(capture.text(),
-            "Dropped Java exception from Tovra::EventDelegateBase::didDecode (no Java caller on this "
-            "thread): java/lang/IllegalStateException: lost\n");
-  EXPECT_FALSE(vm.pending);
-  EXPECT_TRUE(vm.calls.empty());
-}
+// Parked callback exceptions keep their identity through global references, which need a real
+// virtual machine: the JUnit suite checks them (DirectorTest, EngineEndToEndTest).
 
 TEST(DirectorExceptionTest, ClassesThatCannotBeFoundComeBackAsRuntimeException) {
   FakeVm vm;

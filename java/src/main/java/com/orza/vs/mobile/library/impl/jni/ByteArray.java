@@ -6,16 +6,16 @@ public class ByteArray extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  ByteArray(long cPtr, Object parent) {
+  ByteArray(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(ByteArray obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_ByteArray(cPtr);
   }
 
@@ -29,15 +29,15 @@ public class ByteArray extends NativeObject {
 
   /** A fresh copy of the bytes ({@link #getLength} of them); empty when there are none. */
   public byte[] getData() {
-    return OrzaVSMobileJNI.ByteArray_getData(swigCPtr, this);
+    return OrzaVSMobileJNI.ByteArray_getData(swigCPtr(), this);
   }
 
   public int getLength() {
-    return OrzaVSMobileJNI.ByteArray_getLength(swigCPtr, this);
+    return OrzaVSMobileJNI.ByteArray_getLength(swigCPtr(), this);
   }
 
   /** Forgets the bytes (nothing is freed). */
   public void clear() {
-    OrzaVSMobileJNI.ByteArray_clear(swigCPtr, this);
+    OrzaVSMobileJNI.ByteArray_clear(swigCPtr(), this);
   }
 }

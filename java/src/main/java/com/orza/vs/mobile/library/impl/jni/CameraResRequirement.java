@@ -6,16 +6,16 @@ public class CameraResRequirement extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  CameraResRequirement(long cPtr, Object parent) {
+  CameraResRequirement(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(CameraResRequirement obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_CameraResRequirement(cPtr);
   }
 
@@ -24,18 +24,18 @@ public class CameraResRequirement extends NativeObject {
   }
 
   public void setMinHeight(int value) {
-    OrzaVSMobileJNI.CameraResRequirement_minHeight_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.CameraResRequirement_minHeight_set(swigCPtr(), this, value);
   }
 
   public int getMinHeight() {
-    return OrzaVSMobileJNI.CameraResRequirement_minHeight_get(swigCPtr, this);
+    return OrzaVSMobileJNI.CameraResRequirement_minHeight_get(swigCPtr(), this);
   }
 
   public void setMaxHeight(int value) {
-    OrzaVSMobileJNI.CameraResRequirement_maxHeight_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.CameraResRequirement_maxHeight_set(swigCPtr(), this, value);
   }
 
   public int getMaxHeight() {
-    return OrzaVSMobileJNI.CameraResRequirement_maxHeight_get(swigCPtr, this);
+    return OrzaVSMobileJNI.CameraResRequirement_maxHeight_get(swigCPtr(), this);
   }
 }

@@ -11,18 +11,21 @@ package com.orza.vs.mobile.library.impl.jni;
  * should return quickly.
  *
  * <p>Arguments are borrowed: the vectors and the metadata are views of the engine's objects,
- * valid only until the callback returns. Copy what you keep. An enumeration value that has no
- * constant in its Java class arrives as null.
+ * valid only until the callback returns; afterwards any use of them, or of an element or field
+ * taken from them, throws IllegalStateException. Copy what you keep:
+ * {@code new ArrayList<>(objects)} gives owned copies of the results, {@code metadata.copy()}
+ * an owned metadata. An enumeration value that has no constant in its Java class arrives as null.
  *
  * <p>An exception thrown by a callback does not reach the engine. When the callback runs inside
- * a call from Java (for example {@code process}), that call rethrows it when it returns;
- * otherwise (a native worker thread) it is printed and dropped.
+ * a call from Java (for example {@code process} or {@code pushServerResponse}), that call throws
+ * the same exception object when it returns; otherwise (the engine's worker thread) it goes to
+ * {@link OrzaVSMobile#setCallbackExceptionHandler the callback exception handler}.
  *
  * <p>Lifetime: the native side holds this object through a weak reference. Keep the delegate
  * reachable for as long as the engine may call it (the {@link TovraStateEngineFacade} proxy
  * keeps the one it was built with).
  */
-public class EventDelegateBase {
+public class EventDelegateBase implements AutoCloseable {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
 
@@ -49,6 +52,12 @@ public class EventDelegateBase {
       }
       swigCPtr = 0;
     }
+  }
+
+  /** Same as {@link #delete()}, for try-with-resources. */
+  @Override
+  public void close() {
+    delete();
   }
 
   /** Called by the native delegate while it is destroyed: forget the handle. */

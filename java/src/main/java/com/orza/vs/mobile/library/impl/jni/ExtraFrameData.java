@@ -9,16 +9,16 @@ public class ExtraFrameData extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  ExtraFrameData(long cPtr, Object parent) {
+  ExtraFrameData(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(ExtraFrameData obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_ExtraFrameData(cPtr);
   }
 
@@ -28,55 +28,55 @@ public class ExtraFrameData extends NativeObject {
 
   /** Copies {@code value} into this object. */
   public void setDisplayROI(FrameROI value) {
-    OrzaVSMobileJNI.ExtraFrameData_displayROI_set(swigCPtr, this, FrameROI.getCPtr(value), value);
+    OrzaVSMobileJNI.ExtraFrameData_displayROI_set(swigCPtr(), this, FrameROI.getCPtr(value), value);
   }
 
   /** A view into this object (not a copy); valid while this object lives. */
   public FrameROI getDisplayROI() {
-    long cPtr = OrzaVSMobileJNI.ExtraFrameData_displayROI_get(swigCPtr, this);
-    return (cPtr == 0) ? null : new FrameROI(cPtr, this);
+    long cPtr = OrzaVSMobileJNI.ExtraFrameData_displayROI_get(swigCPtr(), this);
+    return (cPtr == 0) ? null : new FrameROI(cPtr, nref);
   }
 
   /** Copies {@code value} into this object. */
   public void setFocusROI(FrameROI value) {
-    OrzaVSMobileJNI.ExtraFrameData_focusROI_set(swigCPtr, this, FrameROI.getCPtr(value), value);
+    OrzaVSMobileJNI.ExtraFrameData_focusROI_set(swigCPtr(), this, FrameROI.getCPtr(value), value);
   }
 
   /** A view into this object (not a copy); valid while this object lives. */
   public FrameROI getFocusROI() {
-    long cPtr = OrzaVSMobileJNI.ExtraFrameData_focusROI_get(swigCPtr, this);
-    return (cPtr == 0) ? null : new FrameROI(cPtr, this);
+    long cPtr = OrzaVSMobileJNI.ExtraFrameData_focusROI_get(swigCPtr(), this);
+    return (cPtr == 0) ? null : new FrameROI(cPtr, nref);
   }
 
   public void setScreenOrient(int value) {
-    OrzaVSMobileJNI.ExtraFrameData_screenOrient_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ExtraFrameData_screenOrient_set(swigCPtr(), this, value);
   }
 
   public int getScreenOrient() {
-    return OrzaVSMobileJNI.ExtraFrameData_screenOrient_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ExtraFrameData_screenOrient_get(swigCPtr(), this);
   }
 
   public void setFieldOfView(double value) {
-    OrzaVSMobileJNI.ExtraFrameData_fieldOfView_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ExtraFrameData_fieldOfView_set(swigCPtr(), this, value);
   }
 
   public double getFieldOfView() {
-    return OrzaVSMobileJNI.ExtraFrameData_fieldOfView_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ExtraFrameData_fieldOfView_get(swigCPtr(), this);
   }
 
   public void setFlat(boolean value) {
-    OrzaVSMobileJNI.ExtraFrameData_flat_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ExtraFrameData_flat_set(swigCPtr(), this, value);
   }
 
   public boolean getFlat() {
-    return OrzaVSMobileJNI.ExtraFrameData_flat_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ExtraFrameData_flat_get(swigCPtr(), this);
   }
 
   public void setTimeStamp(double value) {
-    OrzaVSMobileJNI.ExtraFrameData_timeStamp_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ExtraFrameData_timeStamp_set(swigCPtr(), this, value);
   }
 
   public double getTimeStamp() {
-    return OrzaVSMobileJNI.ExtraFrameData_timeStamp_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ExtraFrameData_timeStamp_get(swigCPtr(), this);
   }
 }

@@ -6,16 +6,16 @@ public class FrameID extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  FrameID(long cPtr, Object parent) {
+  FrameID(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(FrameID obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_FrameID(cPtr);
   }
 
@@ -24,10 +24,10 @@ public class FrameID extends NativeObject {
   }
 
   public void setId(String value) {
-    OrzaVSMobileJNI.FrameID_id_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.FrameID_id_set(swigCPtr(), this, value);
   }
 
   public String getId() {
-    return OrzaVSMobileJNI.FrameID_id_get(swigCPtr, this);
+    return OrzaVSMobileJNI.FrameID_id_get(swigCPtr(), this);
   }
 }

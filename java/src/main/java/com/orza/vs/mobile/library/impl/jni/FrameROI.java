@@ -6,16 +6,16 @@ public class FrameROI extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  FrameROI(long cPtr, Object parent) {
+  FrameROI(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(FrameROI obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_FrameROI(cPtr);
   }
 
@@ -24,34 +24,34 @@ public class FrameROI extends NativeObject {
   }
 
   public void setX(int value) {
-    OrzaVSMobileJNI.FrameROI_x_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.FrameROI_x_set(swigCPtr(), this, value);
   }
 
   public int getX() {
-    return OrzaVSMobileJNI.FrameROI_x_get(swigCPtr, this);
+    return OrzaVSMobileJNI.FrameROI_x_get(swigCPtr(), this);
   }
 
   public void setY(int value) {
-    OrzaVSMobileJNI.FrameROI_y_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.FrameROI_y_set(swigCPtr(), this, value);
   }
 
   public int getY() {
-    return OrzaVSMobileJNI.FrameROI_y_get(swigCPtr, this);
+    return OrzaVSMobileJNI.FrameROI_y_get(swigCPtr(), this);
   }
 
   public void setWidth(int value) {
-    OrzaVSMobileJNI.FrameROI_width_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.FrameROI_width_set(swigCPtr(), this, value);
   }
 
   public int getWidth() {
-    return OrzaVSMobileJNI.FrameROI_width_get(swigCPtr, this);
+    return OrzaVSMobileJNI.FrameROI_width_get(swigCPtr(), this);
   }
 
   public void setHeight(int value) {
-    OrzaVSMobileJNI.FrameROI_height_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.FrameROI_height_set(swigCPtr(), this, value);
   }
 
   public int getHeight() {
-    return OrzaVSMobileJNI.FrameROI_height_get(swigCPtr, this);
+    return OrzaVSMobileJNI.FrameROI_height_get(swigCPtr(), this);
   }
 }

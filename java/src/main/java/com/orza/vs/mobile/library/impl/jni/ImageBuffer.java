@@ -12,16 +12,16 @@ public class ImageBuffer extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  ImageBuffer(long cPtr, Object parent) {
+  ImageBuffer(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(ImageBuffer obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_ImageBuffer(cPtr);
   }
 
@@ -34,51 +34,51 @@ public class ImageBuffer extends NativeObject {
   }
 
   public void setWidth(int value) {
-    OrzaVSMobileJNI.ImageBuffer_width_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ImageBuffer_width_set(swigCPtr(), this, value);
   }
 
   public int getWidth() {
-    return OrzaVSMobileJNI.ImageBuffer_width_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ImageBuffer_width_get(swigCPtr(), this);
   }
 
   public void setHeight(int value) {
-    OrzaVSMobileJNI.ImageBuffer_height_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ImageBuffer_height_set(swigCPtr(), this, value);
   }
 
   public int getHeight() {
-    return OrzaVSMobileJNI.ImageBuffer_height_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ImageBuffer_height_get(swigCPtr(), this);
   }
 
   public void setWidthStep(int value) {
-    OrzaVSMobileJNI.ImageBuffer_widthStep_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ImageBuffer_widthStep_set(swigCPtr(), this, value);
   }
 
   public int getWidthStep() {
-    return OrzaVSMobileJNI.ImageBuffer_widthStep_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ImageBuffer_widthStep_get(swigCPtr(), this);
   }
 
   public void setNumChannels(int value) {
-    OrzaVSMobileJNI.ImageBuffer_numChannels_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ImageBuffer_numChannels_set(swigCPtr(), this, value);
   }
 
   public int getNumChannels() {
-    return OrzaVSMobileJNI.ImageBuffer_numChannels_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ImageBuffer_numChannels_get(swigCPtr(), this);
   }
 
   public void setFormat(ImageFormat value) {
-    OrzaVSMobileJNI.ImageBuffer_format_set(swigCPtr, this, value.swigValue());
+    OrzaVSMobileJNI.ImageBuffer_format_set(swigCPtr(), this, value.swigValue());
   }
 
   public ImageFormat getFormat() {
-    return ImageFormat.swigToEnum(OrzaVSMobileJNI.ImageBuffer_format_get(swigCPtr, this));
+    return ImageFormat.swigToEnum(OrzaVSMobileJNI.ImageBuffer_format_get(swigCPtr(), this));
   }
 
   public void setDefinition(int value) {
-    OrzaVSMobileJNI.ImageBuffer_definition_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ImageBuffer_definition_set(swigCPtr(), this, value);
   }
 
   public int getDefinition() {
-    return OrzaVSMobileJNI.ImageBuffer_definition_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ImageBuffer_definition_get(swigCPtr(), this);
   }
 
   /**
@@ -86,20 +86,20 @@ public class ImageBuffer extends NativeObject {
    * allocLen becomes 0, so the new memory is read by the engine but never filled.
    */
   public void setData(SWIGTYPE_p_unsigned_char value) {
-    OrzaVSMobileJNI.ImageBuffer_data_set(swigCPtr, this, SWIGTYPE_p_unsigned_char.getCPtr(value));
+    OrzaVSMobileJNI.ImageBuffer_data_set(swigCPtr(), this, SWIGTYPE_p_unsigned_char.getCPtr(value));
   }
 
   public SWIGTYPE_p_unsigned_char getData() {
-    long cPtr = OrzaVSMobileJNI.ImageBuffer_data_get(swigCPtr, this);
+    long cPtr = OrzaVSMobileJNI.ImageBuffer_data_get(swigCPtr(), this);
     return (cPtr == 0) ? null : new SWIGTYPE_p_unsigned_char(cPtr, false);
   }
 
   public void setAllocLen(int value) {
-    OrzaVSMobileJNI.ImageBuffer_allocLen_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ImageBuffer_allocLen_set(swigCPtr(), this, value);
   }
 
   public int getAllocLen() {
-    return OrzaVSMobileJNI.ImageBuffer_allocLen_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ImageBuffer_allocLen_get(swigCPtr(), this);
   }
 
   /**
@@ -107,7 +107,7 @@ public class ImageBuffer extends NativeObject {
    * {@code length}, or 0 when the allocation fails.
    */
   public int allocateBuffer(int length) {
-    return OrzaVSMobileJNI.ImageBuffer_allocateBuffer(swigCPtr, this, length);
+    return OrzaVSMobileJNI.ImageBuffer_allocateBuffer(swigCPtr(), this, length);
   }
 
   /**
@@ -115,7 +115,7 @@ public class ImageBuffer extends NativeObject {
    * returns the count copied (0 for a buffer without fillable memory or a null array).
    */
   public int fillBuffer(byte[] source, int length) {
-    return OrzaVSMobileJNI.ImageBuffer_fillBuffer(swigCPtr, this, source, length);
+    return OrzaVSMobileJNI.ImageBuffer_fillBuffer(swigCPtr(), this, source, length);
   }
 
   /**
@@ -123,7 +123,7 @@ public class ImageBuffer extends NativeObject {
    * capacity, allocLen) bytes. A heap (non-direct) buffer or null copies nothing and returns 0.
    */
   public int fillBufferWithByteBuffer(java.nio.ByteBuffer source, int length) {
-    return OrzaVSMobileJNI.ImageBuffer_fillBufferWithByteBuffer__SWIG_0(swigCPtr, this, source, length);
+    return OrzaVSMobileJNI.ImageBuffer_fillBufferWithByteBuffer__SWIG_0(swigCPtr(), this, source, length);
   }
 
   /**
@@ -132,12 +132,12 @@ public class ImageBuffer extends NativeObject {
    */
   public int fillBufferWithByteBuffer(java.nio.ByteBuffer first, int firstLength,
                                       java.nio.ByteBuffer second, int secondLength) {
-    return OrzaVSMobileJNI.ImageBuffer_fillBufferWithByteBuffer__SWIG_1(swigCPtr, this, first,
+    return OrzaVSMobileJNI.ImageBuffer_fillBufferWithByteBuffer__SWIG_1(swigCPtr(), this, first,
         firstLength, second, secondLength);
   }
 
   /** Gives up memory that this buffer allocated itself; allocLen becomes 0. */
   public void releaseBuffer() {
-    OrzaVSMobileJNI.ImageBuffer_releaseBuffer(swigCPtr, this);
+    OrzaVSMobileJNI.ImageBuffer_releaseBuffer(swigCPtr(), this);
   }
 }

@@ -1,27 +1,24 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * An ordered map from string to double. A missing key in {@link #get} or {@link #del} raises IndexOutOfBoundsException
- * "key not found"; a null key raises NullPointerException "null string".
+ * A {@code std::map} as a {@link java.util.Map}: an ordered map from string to double.
+ * See {@link NativeMap} for the rules on absent keys and lifetimes.
  */
-public class MapOfStringToDouble extends NativeObject {
+public class MapOfStringToDouble extends NativeMap<Double> {
   public MapOfStringToDouble(long cPtr, boolean cMemoryOwn) {
     super(cPtr, cMemoryOwn);
   }
 
-  MapOfStringToDouble(long cPtr, Object parent) {
+  MapOfStringToDouble(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(MapOfStringToDouble obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void deleteNative(long cPtr) {
-    OrzaVSMobileJNI.delete_MapOfStringToDouble(cPtr);
-  }
-
+  /** An empty map. */
   public MapOfStringToDouble() {
     this(OrzaVSMobileJNI.new_MapOfStringToDouble__SWIG_0(), true);
   }
@@ -31,42 +28,64 @@ public class MapOfStringToDouble extends NativeObject {
     this(OrzaVSMobileJNI.new_MapOfStringToDouble__SWIG_1(MapOfStringToDouble.getCPtr(other), other), true);
   }
 
-  public int size() {
-    return OrzaVSMobileJNI.MapOfStringToDouble_size(swigCPtr, this);
+  /** An owned map holding the entries of {@code entries}. */
+  public MapOfStringToDouble(java.util.Map<String, ? extends Double> entries) {
+    this();
+    putAll(entries);
   }
 
-  public boolean empty() {
-    return OrzaVSMobileJNI.MapOfStringToDouble_empty(swigCPtr, this);
-  }
-
-  public void clear() {
-    OrzaVSMobileJNI.MapOfStringToDouble_clear(swigCPtr, this);
-  }
-
-  public double get(String key) {
-    return OrzaVSMobileJNI.MapOfStringToDouble_get(swigCPtr, this, key);
-  }
-
-  /** Inserts or overwrites. */
-  public void set(String key, double x) {
-    OrzaVSMobileJNI.MapOfStringToDouble_set(swigCPtr, this, key, x);
-  }
-
-  public void del(String key) {
-    OrzaVSMobileJNI.MapOfStringToDouble_del(swigCPtr, this, key);
-  }
-
-  public boolean has_key(String key) {
-    return OrzaVSMobileJNI.MapOfStringToDouble_has_key(swigCPtr, this, key);
-  }
-
-  /** Every key in ascending order, as a new vector owned by the caller. */
+  /** Same as {@link #getKeys}. */
   public VectorOfString getKeysForDoubleMap() {
-    return new VectorOfString(OrzaVSMobileJNI.MapOfStringToDouble_getKeysForDoubleMap(swigCPtr, this), true);
+    return getKeys();
   }
 
-  /** Same as {@link #getKeysForDoubleMap}. */
-  public VectorOfString getKeys() {
-    return getKeysForDoubleMap();
+  /** Inserts or overwrites (a plain double, so that number literals need no boxing). */
+  public void set(String key, double value) {
+    set(key, Double.valueOf(value));
+  }
+
+  @Override
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToDouble_size(cPtr, this);
+  }
+
+  @Override
+  boolean nativeEmpty(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToDouble_empty(cPtr, this);
+  }
+
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.MapOfStringToDouble_clear(cPtr, this);
+  }
+
+  @Override
+  Double nativeGet(long cPtr, String key) {
+    return OrzaVSMobileJNI.MapOfStringToDouble_get(cPtr, this, key);
+  }
+
+  @Override
+  void nativeSet(long cPtr, String key, Double value) {
+    OrzaVSMobileJNI.MapOfStringToDouble_set(cPtr, this, key, value);
+  }
+
+  @Override
+  void nativeDel(long cPtr, String key) {
+    OrzaVSMobileJNI.MapOfStringToDouble_del(cPtr, this, key);
+  }
+
+  @Override
+  boolean nativeHasKey(long cPtr, String key) {
+    return OrzaVSMobileJNI.MapOfStringToDouble_has_key(cPtr, this, key);
+  }
+
+  @Override
+  long nativeKeys(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToDouble_getKeysForDoubleMap(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_MapOfStringToDouble(cPtr);
   }
 }

@@ -1,27 +1,24 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * An ordered map from string to string. A missing key in {@link #get} or {@link #del} raises IndexOutOfBoundsException
- * "key not found"; a null key raises NullPointerException "null string".
+ * A {@code std::map} as a {@link java.util.Map}: an ordered map from string to string; a null value raises NullPointerException "null string".
+ * See {@link NativeMap} for the rules on absent keys and lifetimes.
  */
-public class MapOfStringToString extends NativeObject {
+public class MapOfStringToString extends NativeMap<String> {
   public MapOfStringToString(long cPtr, boolean cMemoryOwn) {
     super(cPtr, cMemoryOwn);
   }
 
-  MapOfStringToString(long cPtr, Object parent) {
+  MapOfStringToString(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(MapOfStringToString obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void deleteNative(long cPtr) {
-    OrzaVSMobileJNI.delete_MapOfStringToString(cPtr);
-  }
-
+  /** An empty map. */
   public MapOfStringToString() {
     this(OrzaVSMobileJNI.new_MapOfStringToString__SWIG_0(), true);
   }
@@ -31,37 +28,54 @@ public class MapOfStringToString extends NativeObject {
     this(OrzaVSMobileJNI.new_MapOfStringToString__SWIG_1(MapOfStringToString.getCPtr(other), other), true);
   }
 
-  public int size() {
-    return OrzaVSMobileJNI.MapOfStringToString_size(swigCPtr, this);
+  /** An owned map holding the entries of {@code entries}. */
+  public MapOfStringToString(java.util.Map<String, ? extends String> entries) {
+    this();
+    putAll(entries);
   }
 
-  public boolean empty() {
-    return OrzaVSMobileJNI.MapOfStringToString_empty(swigCPtr, this);
+  @Override
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToString_size(cPtr, this);
   }
 
-  public void clear() {
-    OrzaVSMobileJNI.MapOfStringToString_clear(swigCPtr, this);
+  @Override
+  boolean nativeEmpty(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToString_empty(cPtr, this);
   }
 
-  public String get(String key) {
-    return OrzaVSMobileJNI.MapOfStringToString_get(swigCPtr, this, key);
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.MapOfStringToString_clear(cPtr, this);
   }
 
-  /** Inserts or overwrites. */
-  public void set(String key, String x) {
-    OrzaVSMobileJNI.MapOfStringToString_set(swigCPtr, this, key, x);
+  @Override
+  String nativeGet(long cPtr, String key) {
+    return OrzaVSMobileJNI.MapOfStringToString_get(cPtr, this, key);
   }
 
-  public void del(String key) {
-    OrzaVSMobileJNI.MapOfStringToString_del(swigCPtr, this, key);
+  @Override
+  void nativeSet(long cPtr, String key, String value) {
+    OrzaVSMobileJNI.MapOfStringToString_set(cPtr, this, key, value);
   }
 
-  public boolean has_key(String key) {
-    return OrzaVSMobileJNI.MapOfStringToString_has_key(swigCPtr, this, key);
+  @Override
+  void nativeDel(long cPtr, String key) {
+    OrzaVSMobileJNI.MapOfStringToString_del(cPtr, this, key);
   }
 
-  /** Every key in ascending order, as a new vector owned by the caller. */
-  public VectorOfString getKeys() {
-    return new VectorOfString(OrzaVSMobileJNI.MapOfStringToString_getKeys(swigCPtr, this), true);
+  @Override
+  boolean nativeHasKey(long cPtr, String key) {
+    return OrzaVSMobileJNI.MapOfStringToString_has_key(cPtr, this, key);
+  }
+
+  @Override
+  long nativeKeys(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToString_getKeys(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_MapOfStringToString(cPtr);
   }
 }

@@ -1,28 +1,24 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * An ordered map from string to unsigned 32-bit integer (values 0 to 4294967295;
- * a value set from Java is taken modulo 2^32). A missing key in {@link #get} or {@link #del} raises IndexOutOfBoundsException
- * "key not found"; a null key raises NullPointerException "null string".
+ * A {@code std::map} as a {@link java.util.Map}: an ordered map from string to unsigned 32-bit integer (values 0 to 4294967295; a value set from Java is taken modulo 2^32).
+ * See {@link NativeMap} for the rules on absent keys and lifetimes.
  */
-public class MapOfStringToUInt extends NativeObject {
+public class MapOfStringToUInt extends NativeMap<Long> {
   public MapOfStringToUInt(long cPtr, boolean cMemoryOwn) {
     super(cPtr, cMemoryOwn);
   }
 
-  MapOfStringToUInt(long cPtr, Object parent) {
+  MapOfStringToUInt(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(MapOfStringToUInt obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void deleteNative(long cPtr) {
-    OrzaVSMobileJNI.delete_MapOfStringToUInt(cPtr);
-  }
-
+  /** An empty map. */
   public MapOfStringToUInt() {
     this(OrzaVSMobileJNI.new_MapOfStringToUInt__SWIG_0(), true);
   }
@@ -32,42 +28,64 @@ public class MapOfStringToUInt extends NativeObject {
     this(OrzaVSMobileJNI.new_MapOfStringToUInt__SWIG_1(MapOfStringToUInt.getCPtr(other), other), true);
   }
 
-  public int size() {
-    return OrzaVSMobileJNI.MapOfStringToUInt_size(swigCPtr, this);
+  /** An owned map holding the entries of {@code entries}. */
+  public MapOfStringToUInt(java.util.Map<String, ? extends Long> entries) {
+    this();
+    putAll(entries);
   }
 
-  public boolean empty() {
-    return OrzaVSMobileJNI.MapOfStringToUInt_empty(swigCPtr, this);
-  }
-
-  public void clear() {
-    OrzaVSMobileJNI.MapOfStringToUInt_clear(swigCPtr, this);
-  }
-
-  public long get(String key) {
-    return OrzaVSMobileJNI.MapOfStringToUInt_get(swigCPtr, this, key);
-  }
-
-  /** Inserts or overwrites. */
-  public void set(String key, long x) {
-    OrzaVSMobileJNI.MapOfStringToUInt_set(swigCPtr, this, key, x);
-  }
-
-  public void del(String key) {
-    OrzaVSMobileJNI.MapOfStringToUInt_del(swigCPtr, this, key);
-  }
-
-  public boolean has_key(String key) {
-    return OrzaVSMobileJNI.MapOfStringToUInt_has_key(swigCPtr, this, key);
-  }
-
-  /** Every key in ascending order, as a new vector owned by the caller. */
+  /** Same as {@link #getKeys}. */
   public VectorOfString getKeysForIntMap() {
-    return new VectorOfString(OrzaVSMobileJNI.MapOfStringToUInt_getKeysForIntMap(swigCPtr, this), true);
+    return getKeys();
   }
 
-  /** Same as {@link #getKeysForIntMap}. */
-  public VectorOfString getKeys() {
-    return getKeysForIntMap();
+  /** Inserts or overwrites (a plain long, so that number literals need no boxing). */
+  public void set(String key, long value) {
+    set(key, Long.valueOf(value));
+  }
+
+  @Override
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToUInt_size(cPtr, this);
+  }
+
+  @Override
+  boolean nativeEmpty(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToUInt_empty(cPtr, this);
+  }
+
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.MapOfStringToUInt_clear(cPtr, this);
+  }
+
+  @Override
+  Long nativeGet(long cPtr, String key) {
+    return OrzaVSMobileJNI.MapOfStringToUInt_get(cPtr, this, key);
+  }
+
+  @Override
+  void nativeSet(long cPtr, String key, Long value) {
+    OrzaVSMobileJNI.MapOfStringToUInt_set(cPtr, this, key, value);
+  }
+
+  @Override
+  void nativeDel(long cPtr, String key) {
+    OrzaVSMobileJNI.MapOfStringToUInt_del(cPtr, this, key);
+  }
+
+  @Override
+  boolean nativeHasKey(long cPtr, String key) {
+    return OrzaVSMobileJNI.MapOfStringToUInt_has_key(cPtr, this, key);
+  }
+
+  @Override
+  long nativeKeys(long cPtr) {
+    return OrzaVSMobileJNI.MapOfStringToUInt_getKeysForIntMap(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_MapOfStringToUInt(cPtr);
   }
 }

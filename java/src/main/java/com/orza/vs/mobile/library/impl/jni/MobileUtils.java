@@ -6,16 +6,16 @@ public class MobileUtils extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  MobileUtils(long cPtr, Object parent) {
+  MobileUtils(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(MobileUtils obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_MobileUtils(cPtr);
   }
 

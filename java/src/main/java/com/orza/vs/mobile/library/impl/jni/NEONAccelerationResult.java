@@ -6,16 +6,16 @@ public class NEONAccelerationResult extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  NEONAccelerationResult(long cPtr, Object parent) {
+  NEONAccelerationResult(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(NEONAccelerationResult obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_NEONAccelerationResult(cPtr);
   }
 
@@ -24,10 +24,10 @@ public class NEONAccelerationResult extends NativeObject {
   }
 
   public void setResultStr(String value) {
-    OrzaVSMobileJNI.NEONAccelerationResult_resultStr_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.NEONAccelerationResult_resultStr_set(swigCPtr(), this, value);
   }
 
   public String getResultStr() {
-    return OrzaVSMobileJNI.NEONAccelerationResult_resultStr_get(swigCPtr, this);
+    return OrzaVSMobileJNI.NEONAccelerationResult_resultStr_get(swigCPtr(), this);
   }
 }

@@ -1,48 +1,51 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * The lifecycle shared by the proxies of native records and containers: the native handle,
- * whether this proxy owns the native object, and (for a borrowed view) the parent that keeps
- * the native owner alive. An owning proxy frees its native object once, through
- * {@link #deleteNative}, on {@link #delete} or when it is finalized.
+ * The base of the proxies of native records: the object's lifecycle ({@link NativeRef}) and
+ * {@link #delete}/{@link #close}. An owning proxy frees its native object once, on
+ * {@code delete()}, {@code close()} or when it is finalized; a view (a field of another
+ * object, an element of a vector, a callback's argument) never frees and becomes unusable with
+ * what it borrows from.
  */
-abstract class NativeObject {
-  /** The native address; 0 once deleted. */
-  protected transient long swigCPtr;
-  /** Whether this proxy frees the native object. */
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
+public abstract class NativeObject implements AutoCloseable {
+  final NativeRef nref;
 
-  protected NativeObject(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+  NativeObject(long cPtr, boolean cMemoryOwn) {
+    nref = new NativeRef(this, cPtr, cMemoryOwn);
   }
 
-  /** A borrowed view that does not own its native object and keeps {@code parent} reachable. */
-  protected NativeObject(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+  /** A view that lives inside {@code parent}. */
+  NativeObject(long cPtr, NativeRef parent) {
+    nref = new NativeRef(this, cPtr, parent);
+  }
+
+  /**
+   * The native address, for a native call.
+   *
+   * @throws IllegalStateException when the object has been deleted, or lives in something that
+   *     is gone (a callback argument after its callback, a field of a deleted object)
+   */
+  protected final long swigCPtr() {
+    return nref.get();
   }
 
   /** Frees the native object at {@code cPtr}; called at most once, only for an owned object. */
-  protected abstract void deleteNative(long cPtr);
+  abstract void deleteNative(long cPtr);
 
   @Override
   protected void finalize() {
     delete();
   }
 
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        deleteNative(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
+  /** Frees the native object if this proxy owns it; afterwards any use throws IllegalStateException. */
+  public void delete() {
+    long cPtr = nref.endDeleted();
+    if (cPtr != 0) deleteNative(cPtr);
+  }
+
+  /** Same as {@link #delete()}, for try-with-resources. */
+  @Override
+  public void close() {
+    delete();
   }
 }

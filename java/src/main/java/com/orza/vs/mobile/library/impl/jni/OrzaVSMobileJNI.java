@@ -356,19 +356,40 @@ public class OrzaVSMobileJNI {
         value32);
   }
 
+  // Borrowed arguments: views of the caller's objects for the duration of the call only. Each is
+  // ended when the override returns, so that a view kept beyond the call fails cleanly
+  // (IllegalStateException) instead of reading memory the engine has released.
+
   public static void SwigDirector_EventDelegateBase_didDetect(EventDelegateBase jself,
       long objects) {
-    jself.didDetect(new VectorOfObjectInfo(objects, false));
+    VectorOfObjectInfo list = new VectorOfObjectInfo(objects, false);
+    try {
+      jself.didDetect(list);
+    } finally {
+      list.nref.endBorrow();
+    }
   }
 
   public static void SwigDirector_EventDelegateBase_didDecode(EventDelegateBase jself,
       long objects, long metadata) {
-    jself.didDecode(new VectorOfObjectInfo(objects, false), new ResultMetadata(metadata, false));
+    VectorOfObjectInfo list = new VectorOfObjectInfo(objects, false);
+    ResultMetadata meta = new ResultMetadata(metadata, false);
+    try {
+      jself.didDecode(list, meta);
+    } finally {
+      list.nref.endBorrow();
+      meta.nref.endBorrow();
+    }
   }
 
   public static void SwigDirector_EventDelegateBase_didDetectInterestPoints(
       EventDelegateBase jself, long points) {
-    jself.didDetectInterestPoints(new VectorOfPoint2f(points, false));
+    VectorOfPoint2f list = new VectorOfPoint2f(points, false);
+    try {
+      jself.didDetectInterestPoints(list);
+    } finally {
+      list.nref.endBorrow();
+    }
   }
 
   public static void SwigDirector_EventDelegateBase_didReceiveServerError(EventDelegateBase jself,
@@ -403,11 +424,28 @@ public class OrzaVSMobileJNI {
 
   public static boolean SwigDirector_ServerDelegate_sendServerRequest(ServerDelegate jself,
       long request) {
-    return jself.sendServerRequest(new ServerRequest(request, false));
+    ServerRequest borrowed = new ServerRequest(request, false);
+    try {
+      return jself.sendServerRequest(borrowed);
+    } finally {
+      borrowed.nref.endBorrow();
+    }
   }
 
   public static boolean SwigDirector_ServerDelegate_sendServerRequestImpl(ServerDelegate jself,
       long request) {
-    return jself.sendServerRequestImpl(new ServerRequest(request, false));
+    ServerRequest borrowed = new ServerRequest(request, false);
+    try {
+      return jself.sendServerRequestImpl(borrowed);
+    } finally {
+      borrowed.nref.endBorrow();
+    }
+  }
+
+  // Called by the library with an exception that a callback threw on a thread where no Java
+  // call into the library is waiting for it (the engine's worker). Never throws.
+  @SuppressWarnings("unused")
+  private static void reportUncaughtCallbackException(Throwable thrown) {
+    OrzaVSMobile.reportUncaught(thrown);
   }
 }

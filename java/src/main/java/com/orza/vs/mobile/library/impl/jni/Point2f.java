@@ -6,16 +6,16 @@ public class Point2f extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  Point2f(long cPtr, Object parent) {
+  Point2f(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(Point2f obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_Point2f(cPtr);
   }
 
@@ -28,18 +28,18 @@ public class Point2f extends NativeObject {
   }
 
   public void setX(float value) {
-    OrzaVSMobileJNI.Point2f_x_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.Point2f_x_set(swigCPtr(), this, value);
   }
 
   public float getX() {
-    return OrzaVSMobileJNI.Point2f_x_get(swigCPtr, this);
+    return OrzaVSMobileJNI.Point2f_x_get(swigCPtr(), this);
   }
 
   public void setY(float value) {
-    OrzaVSMobileJNI.Point2f_y_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.Point2f_y_set(swigCPtr(), this, value);
   }
 
   public float getY() {
-    return OrzaVSMobileJNI.Point2f_y_get(swigCPtr, this);
+    return OrzaVSMobileJNI.Point2f_y_get(swigCPtr(), this);
   }
 }

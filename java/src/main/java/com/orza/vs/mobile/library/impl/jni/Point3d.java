@@ -6,16 +6,16 @@ public class Point3d extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  Point3d(long cPtr, Object parent) {
+  Point3d(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(Point3d obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_Point3d(cPtr);
   }
 
@@ -28,26 +28,26 @@ public class Point3d extends NativeObject {
   }
 
   public void setX(double value) {
-    OrzaVSMobileJNI.Point3d_x_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.Point3d_x_set(swigCPtr(), this, value);
   }
 
   public double getX() {
-    return OrzaVSMobileJNI.Point3d_x_get(swigCPtr, this);
+    return OrzaVSMobileJNI.Point3d_x_get(swigCPtr(), this);
   }
 
   public void setY(double value) {
-    OrzaVSMobileJNI.Point3d_y_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.Point3d_y_set(swigCPtr(), this, value);
   }
 
   public double getY() {
-    return OrzaVSMobileJNI.Point3d_y_get(swigCPtr, this);
+    return OrzaVSMobileJNI.Point3d_y_get(swigCPtr(), this);
   }
 
   public void setZ(double value) {
-    OrzaVSMobileJNI.Point3d_z_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.Point3d_z_set(swigCPtr(), this, value);
   }
 
   public double getZ() {
-    return OrzaVSMobileJNI.Point3d_z_get(swigCPtr, this);
+    return OrzaVSMobileJNI.Point3d_z_get(swigCPtr(), this);
   }
 }

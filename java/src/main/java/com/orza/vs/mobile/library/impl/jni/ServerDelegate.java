@@ -18,9 +18,16 @@ package com.orza.vs.mobile.library.impl.jni;
  * as the engine may use it, that is until the facade has been stopped and deleted. The
  * {@link TovraStateEngineFacade} proxy keeps a reference to every transport added to it.
  *
- * <p>An exception thrown by {@code sendServerRequestImpl} on the engine's worker thread cannot
- * reach any Java caller: it is printed and dropped, and the engine sees a failed send (false).
- * Report transfer failures by pushing a response with a code other than 200 instead.
+ * <p>The request is borrowed: after {@code sendServerRequestImpl} returns, any use of it (or of
+ * its parameters, metadata or data) throws IllegalStateException.
+ *
+ * <p>An exception thrown by {@code sendServerRequestImpl} makes the engine give the frame up.
+ * On the engine's worker thread no Java caller can receive it: it goes to
+ * {@link OrzaVSMobile#setCallbackExceptionHandler the callback exception handler}. When the
+ * send was called from Java, that call throws the same exception object. Report transfer
+ * failures by pushing a response with a code other than 200 instead.
+ *
+ * <p>{@link #close()} is {@link #delete()}, for try-with-resources.
  */
 public class ServerDelegate extends ServerDelegateInterface {
   private transient long swigCPtr;
@@ -86,10 +93,30 @@ public class ServerDelegate extends ServerDelegateInterface {
         this, ServerRequest.getCPtr(request), request);
   }
 
-  /** The transfer itself; override it. Returns whether the request was accepted for sending. */
+  /**
+   * The transfer itself; override it. Returns whether the request was accepted for sending.
+   * This class has no implementation of its own: an override must not call
+   * {@code super.sendServerRequestImpl} (UnsupportedOperationException).
+   */
   public boolean sendServerRequestImpl(ServerRequest request) {
+    if (overridesSendServerRequestImpl()) {
+      // Only an override's call to its superclass gets here; going native would come straight
+      // back into the override and recurse without end.
+      throw new UnsupportedOperationException("ServerDelegate.sendServerRequestImpl has no "
+          + "implementation: an override must not call super.sendServerRequestImpl()");
+    }
     return OrzaVSMobileJNI.ServerDelegate_sendServerRequestImpl(swigCPtr, this,
         ServerRequest.getCPtr(request), request);
+  }
+
+  private boolean overridesSendServerRequestImpl() {
+    if (getClass() == ServerDelegate.class) return false;
+    try {
+      return getClass().getMethod("sendServerRequestImpl", ServerRequest.class).getDeclaringClass()
+          != ServerDelegate.class;
+    } catch (NoSuchMethodException e) {
+      return false;  // cannot happen: the method is public here
+    }
   }
 
   /**

@@ -1,7 +1,7 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /** The engine's view of a transport: something it can send a request to. */
-public class ServerDelegateInterface {
+public class ServerDelegateInterface implements AutoCloseable {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
 
@@ -27,6 +27,12 @@ public class ServerDelegateInterface {
       }
       swigCPtr = 0;
     }
+  }
+
+  /** Same as {@link #delete()}, for try-with-resources. */
+  @Override
+  public void close() {
+    delete();
   }
 
   public boolean sendServerRequest(ServerRequest request) {

@@ -10,16 +10,16 @@ public class ServerRequest extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  ServerRequest(long cPtr, Object parent) {
+  ServerRequest(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(ServerRequest obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_ServerRequest(cPtr);
   }
 
@@ -40,57 +40,61 @@ public class ServerRequest extends NativeObject {
   }
 
   public void setId(String value) {
-    OrzaVSMobileJNI.ServerRequest_id_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ServerRequest_id_set(swigCPtr(), this, value);
   }
 
   public String getId() {
-    return OrzaVSMobileJNI.ServerRequest_id_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ServerRequest_id_get(swigCPtr(), this);
   }
 
   /** Copies {@code value} into this object. */
   public void setParams(MapOfStringToString value) {
-    OrzaVSMobileJNI.ServerRequest_params_set(swigCPtr, this, MapOfStringToString.getCPtr(value), value);
+    OrzaVSMobileJNI.ServerRequest_params_set(swigCPtr(), this, MapOfStringToString.getCPtr(value), value);
+    nref.changed();
   }
 
   /** A view into this object (not a copy); valid while this object lives. */
   public MapOfStringToString getParams() {
-    long cPtr = OrzaVSMobileJNI.ServerRequest_params_get(swigCPtr, this);
-    return (cPtr == 0) ? null : new MapOfStringToString(cPtr, this);
+    long cPtr = OrzaVSMobileJNI.ServerRequest_params_get(swigCPtr(), this);
+    return (cPtr == 0) ? null : new MapOfStringToString(cPtr, nref);
   }
 
   /** Copies {@code value} into this object. */
   public void setData(ByteArray value) {
-    OrzaVSMobileJNI.ServerRequest_data_set(swigCPtr, this, ByteArray.getCPtr(value), value);
+    OrzaVSMobileJNI.ServerRequest_data_set(swigCPtr(), this, ByteArray.getCPtr(value), value);
+    nref.changed();
   }
 
   /** A view into this object (not a copy); valid while this object lives. */
   public ByteArray getData() {
-    long cPtr = OrzaVSMobileJNI.ServerRequest_data_get(swigCPtr, this);
-    return (cPtr == 0) ? null : new ByteArray(cPtr, this);
+    long cPtr = OrzaVSMobileJNI.ServerRequest_data_get(swigCPtr(), this);
+    return (cPtr == 0) ? null : new ByteArray(cPtr, nref);
   }
 
   /** Copies {@code value} into this object. */
   public void setMetadata(MapOfStringToString value) {
-    OrzaVSMobileJNI.ServerRequest_metadata_set(swigCPtr, this, MapOfStringToString.getCPtr(value), value);
+    OrzaVSMobileJNI.ServerRequest_metadata_set(swigCPtr(), this, MapOfStringToString.getCPtr(value), value);
+    nref.changed();
   }
 
   /** A view into this object (not a copy); valid while this object lives. */
   public MapOfStringToString getMetadata() {
-    long cPtr = OrzaVSMobileJNI.ServerRequest_metadata_get(swigCPtr, this);
-    return (cPtr == 0) ? null : new MapOfStringToString(cPtr, this);
+    long cPtr = OrzaVSMobileJNI.ServerRequest_metadata_get(swigCPtr(), this);
+    return (cPtr == 0) ? null : new MapOfStringToString(cPtr, nref);
   }
 
   public void setResponseHandler(ServerResponseHandler value) {
-    OrzaVSMobileJNI.ServerRequest_responseHandler_set(swigCPtr, this, ServerResponseHandler.getCPtr(value), value);
+    OrzaVSMobileJNI.ServerRequest_responseHandler_set(swigCPtr(), this, ServerResponseHandler.getCPtr(value), value);
   }
 
   /** The object pointed to (not owned by Java), or null. */
   public ServerResponseHandler getResponseHandler() {
-    long cPtr = OrzaVSMobileJNI.ServerRequest_responseHandler_get(swigCPtr, this);
-    return (cPtr == 0) ? null : new ServerResponseHandler(cPtr, false);
+    long cPtr = OrzaVSMobileJNI.ServerRequest_responseHandler_get(swigCPtr(), this);
+    return (cPtr == 0) ? null : new ServerResponseHandler(cPtr, nref);
   }
 
   public void clear() {
-    OrzaVSMobileJNI.ServerRequest_clear(swigCPtr, this);
+    OrzaVSMobileJNI.ServerRequest_clear(swigCPtr(), this);
+    nref.changed();
   }
 }

@@ -9,16 +9,16 @@ public class ServerResponse extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  ServerResponse(long cPtr, Object parent) {
+  ServerResponse(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(ServerResponse obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_ServerResponse(cPtr);
   }
 
@@ -27,42 +27,42 @@ public class ServerResponse extends NativeObject {
   }
 
   public void setId(String value) {
-    OrzaVSMobileJNI.ServerResponse_id_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ServerResponse_id_set(swigCPtr(), this, value);
   }
 
   public String getId() {
-    return OrzaVSMobileJNI.ServerResponse_id_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ServerResponse_id_get(swigCPtr(), this);
   }
 
   public void setResponseCode(int value) {
-    OrzaVSMobileJNI.ServerResponse_responseCode_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ServerResponse_responseCode_set(swigCPtr(), this, value);
   }
 
   public int getResponseCode() {
-    return OrzaVSMobileJNI.ServerResponse_responseCode_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ServerResponse_responseCode_get(swigCPtr(), this);
   }
 
   public void setResponseStr(String value) {
-    OrzaVSMobileJNI.ServerResponse_responseStr_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ServerResponse_responseStr_set(swigCPtr(), this, value);
   }
 
   public String getResponseStr() {
-    return OrzaVSMobileJNI.ServerResponse_responseStr_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ServerResponse_responseStr_get(swigCPtr(), this);
   }
 
   public void setRoundtripTime(double value) {
-    OrzaVSMobileJNI.ServerResponse_roundtripTime_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ServerResponse_roundtripTime_set(swigCPtr(), this, value);
   }
 
   public double getRoundtripTime() {
-    return OrzaVSMobileJNI.ServerResponse_roundtripTime_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ServerResponse_roundtripTime_get(swigCPtr(), this);
   }
 
   public void setCompressed(boolean value) {
-    OrzaVSMobileJNI.ServerResponse_compressed_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.ServerResponse_compressed_set(swigCPtr(), this, value);
   }
 
   public boolean getCompressed() {
-    return OrzaVSMobileJNI.ServerResponse_compressed_get(swigCPtr, this);
+    return OrzaVSMobileJNI.ServerResponse_compressed_get(swigCPtr(), this);
   }
 }

@@ -9,21 +9,21 @@ public class ServerResponseHandler extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  ServerResponseHandler(long cPtr, Object parent) {
+  ServerResponseHandler(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(ServerResponseHandler obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_ServerResponseHandler(cPtr);
   }
 
   public void handleServerResponse(ServerResponse response) {
-    OrzaVSMobileJNI.ServerResponseHandler_handleServerResponse(swigCPtr, this,
+    OrzaVSMobileJNI.ServerResponseHandler_handleServerResponse(swigCPtr(), this,
         ServerResponse.getCPtr(response), response);
   }
 }

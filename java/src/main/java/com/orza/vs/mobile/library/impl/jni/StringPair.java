@@ -6,16 +6,16 @@ public class StringPair extends NativeObject {
     super(cPtr, cMemoryOwn);
   }
 
-  StringPair(long cPtr, Object parent) {
+  StringPair(long cPtr, NativeRef parent) {
     super(cPtr, parent);
   }
 
   public static long getCPtr(StringPair obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.swigCPtr();
   }
 
   @Override
-  protected void deleteNative(long cPtr) {
+  void deleteNative(long cPtr) {
     OrzaVSMobileJNI.delete_StringPair(cPtr);
   }
 
@@ -32,18 +32,18 @@ public class StringPair extends NativeObject {
   }
 
   public void setFirst(String value) {
-    OrzaVSMobileJNI.StringPair_first_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.StringPair_first_set(swigCPtr(), this, value);
   }
 
   public String getFirst() {
-    return OrzaVSMobileJNI.StringPair_first_get(swigCPtr, this);
+    return OrzaVSMobileJNI.StringPair_first_get(swigCPtr(), this);
   }
 
   public void setSecond(String value) {
-    OrzaVSMobileJNI.StringPair_second_set(swigCPtr, this, value);
+    OrzaVSMobileJNI.StringPair_second_set(swigCPtr(), this, value);
   }
 
   public String getSecond() {
-    return OrzaVSMobileJNI.StringPair_second_get(swigCPtr, this);
+    return OrzaVSMobileJNI.StringPair_second_get(swigCPtr(), this);
   }
 }

@@ -22,7 +22,7 @@ package com.orza.vs.mobile.library.impl.jni;
  * running before this proxy's can free a delegate the engine still calls. {@link #delete} hands
  * them back (and frees those the application deleted meanwhile). Delete the engine first.
  */
-public class TovraStateEngineFacade {
+public class TovraStateEngineFacade implements AutoCloseable {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
   // A delegate the native engine calls, held (and its native object owned) while it lives.
@@ -86,6 +86,16 @@ public class TovraStateEngineFacade {
         }
       }
     }
+  }
+
+  /**
+   * Stops the engine (joining its worker), then does what {@link #delete()} does; for
+   * try-with-resources. Calling it again does nothing.
+   */
+  @Override
+  public void close() {
+    if (swigCPtr != 0) stopEngine();
+    delete();
   }
 
   // Holds a delegate; when Java owns its native object, ownership passes to this facade until

@@ -1,96 +1,81 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * A vector of double ({@code std::vector}). Indices outside 0..size()-1 raise
- * IndexOutOfBoundsException "vector index out of range".
+ * A {@code std::vector} as a {@link java.util.List}: a vector of {@code double}.
+ * See {@link NativeList} for the rules on indices, views and copies.
  */
-public class VectorOfDouble extends java.util.AbstractList<Double> implements java.util.RandomAccess {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class VectorOfDouble extends NativeList<Double> {
   public VectorOfDouble(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
-  VectorOfDouble(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+  VectorOfDouble(long cPtr, NativeRef parent) {
+    super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(VectorOfDouble obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_VectorOfDouble(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
-  }
-
+  /** An empty vector. */
   public VectorOfDouble() {
     this(OrzaVSMobileJNI.new_VectorOfDouble__SWIG_0(), true);
   }
 
-  /** A vector of {@code n} default elements. */
+  /** A vector of {@code n} default elements; IllegalArgumentException when {@code n} is negative. */
   public VectorOfDouble(int n) {
     this(OrzaVSMobileJNI.new_VectorOfDouble__SWIG_1(n), true);
   }
 
-  @Override
-  public int size() {
-    return OrzaVSMobileJNI.VectorOfDouble_size(swigCPtr, this);
-  }
-
-  public int capacity() {
-    return OrzaVSMobileJNI.VectorOfDouble_capacity(swigCPtr, this);
-  }
-
-  public void reserve(int n) {
-    OrzaVSMobileJNI.VectorOfDouble_reserve(swigCPtr, this, n);
+  /** An owned vector holding copies of the elements of {@code elements}. */
+  public VectorOfDouble(java.util.Collection<? extends Double> elements) {
+    this();
+    addAll(elements);
   }
 
   @Override
-  public boolean isEmpty() {
-    return OrzaVSMobileJNI.VectorOfDouble_isEmpty(swigCPtr, this);
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfDouble_size(cPtr, this);
   }
 
   @Override
-  public void clear() {
-    OrzaVSMobileJNI.VectorOfDouble_clear(swigCPtr, this);
-  }
-
-  /** Appends a copy of {@code x}. */
-  @Override
-  public boolean add(Double x) {
-    OrzaVSMobileJNI.VectorOfDouble_add(swigCPtr, this, x);
-    return true;
+  boolean nativeIsEmpty(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfDouble_isEmpty(cPtr, this);
   }
 
   @Override
-  public Double get(int i) {
-    return OrzaVSMobileJNI.VectorOfDouble_get(swigCPtr, this, i);
+  int nativeCapacity(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfDouble_capacity(cPtr, this);
   }
 
-  /** Assigns a copy of {@code x} to element {@code i}; returns the previous element. */
   @Override
-  public Double set(int i, Double x) {
-    Double previous = get(i);
-    OrzaVSMobileJNI.VectorOfDouble_set(swigCPtr, this, i, x);
-    return previous;
+  void nativeReserve(long cPtr, int n) {
+    OrzaVSMobileJNI.VectorOfDouble_reserve(cPtr, this, n);
+  }
+
+  @Override
+  Double nativeGet(long cPtr, int i) {
+    return OrzaVSMobileJNI.VectorOfDouble_get(cPtr, this, i);
+  }
+
+  @Override
+  void nativeSet(long cPtr, int i, Double x) {
+    OrzaVSMobileJNI.VectorOfDouble_set(cPtr, this, i, x);
+  }
+
+  @Override
+  void nativeAdd(long cPtr, Double x) {
+    OrzaVSMobileJNI.VectorOfDouble_add(cPtr, this, x);
+  }
+
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.VectorOfDouble_clear(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_VectorOfDouble(cPtr);
   }
 }

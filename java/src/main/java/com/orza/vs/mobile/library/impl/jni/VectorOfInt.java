@@ -1,96 +1,81 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * A vector of int ({@code std::vector}). Indices outside 0..size()-1 raise
- * IndexOutOfBoundsException "vector index out of range".
+ * A {@code std::vector} as a {@link java.util.List}: a vector of {@code int}.
+ * See {@link NativeList} for the rules on indices, views and copies.
  */
-public class VectorOfInt extends java.util.AbstractList<Integer> implements java.util.RandomAccess {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class VectorOfInt extends NativeList<Integer> {
   public VectorOfInt(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
-  VectorOfInt(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+  VectorOfInt(long cPtr, NativeRef parent) {
+    super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(VectorOfInt obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_VectorOfInt(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
-  }
-
+  /** An empty vector. */
   public VectorOfInt() {
     this(OrzaVSMobileJNI.new_VectorOfInt__SWIG_0(), true);
   }
 
-  /** A vector of {@code n} default elements. */
+  /** A vector of {@code n} default elements; IllegalArgumentException when {@code n} is negative. */
   public VectorOfInt(int n) {
     this(OrzaVSMobileJNI.new_VectorOfInt__SWIG_1(n), true);
   }
 
-  @Override
-  public int size() {
-    return OrzaVSMobileJNI.VectorOfInt_size(swigCPtr, this);
-  }
-
-  public int capacity() {
-    return OrzaVSMobileJNI.VectorOfInt_capacity(swigCPtr, this);
-  }
-
-  public void reserve(int n) {
-    OrzaVSMobileJNI.VectorOfInt_reserve(swigCPtr, this, n);
+  /** An owned vector holding copies of the elements of {@code elements}. */
+  public VectorOfInt(java.util.Collection<? extends Integer> elements) {
+    this();
+    addAll(elements);
   }
 
   @Override
-  public boolean isEmpty() {
-    return OrzaVSMobileJNI.VectorOfInt_isEmpty(swigCPtr, this);
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfInt_size(cPtr, this);
   }
 
   @Override
-  public void clear() {
-    OrzaVSMobileJNI.VectorOfInt_clear(swigCPtr, this);
-  }
-
-  /** Appends a copy of {@code x}. */
-  @Override
-  public boolean add(Integer x) {
-    OrzaVSMobileJNI.VectorOfInt_add(swigCPtr, this, x);
-    return true;
+  boolean nativeIsEmpty(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfInt_isEmpty(cPtr, this);
   }
 
   @Override
-  public Integer get(int i) {
-    return OrzaVSMobileJNI.VectorOfInt_get(swigCPtr, this, i);
+  int nativeCapacity(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfInt_capacity(cPtr, this);
   }
 
-  /** Assigns a copy of {@code x} to element {@code i}; returns the previous element. */
   @Override
-  public Integer set(int i, Integer x) {
-    Integer previous = get(i);
-    OrzaVSMobileJNI.VectorOfInt_set(swigCPtr, this, i, x);
-    return previous;
+  void nativeReserve(long cPtr, int n) {
+    OrzaVSMobileJNI.VectorOfInt_reserve(cPtr, this, n);
+  }
+
+  @Override
+  Integer nativeGet(long cPtr, int i) {
+    return OrzaVSMobileJNI.VectorOfInt_get(cPtr, this, i);
+  }
+
+  @Override
+  void nativeSet(long cPtr, int i, Integer x) {
+    OrzaVSMobileJNI.VectorOfInt_set(cPtr, this, i, x);
+  }
+
+  @Override
+  void nativeAdd(long cPtr, Integer x) {
+    OrzaVSMobileJNI.VectorOfInt_add(cPtr, this, x);
+  }
+
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.VectorOfInt_clear(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_VectorOfInt(cPtr);
   }
 }

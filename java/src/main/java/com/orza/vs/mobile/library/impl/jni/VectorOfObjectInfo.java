@@ -1,105 +1,87 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * A vector of results ({@code std::vector}). Indices outside 0..size()-1 raise
- * IndexOutOfBoundsException "vector index out of range".
- * {@link #get} returns a view into the vector, valid until the vector changes.
+ * A {@code std::vector} as a {@link java.util.List}: a vector of results; {@link #get} returns a view into the vector.
+ * See {@link NativeList} for the rules on indices, views and copies.
  */
-public class VectorOfObjectInfo extends java.util.AbstractList<ObjectInfo> implements java.util.RandomAccess {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class VectorOfObjectInfo extends NativeList<ObjectInfo> {
   public VectorOfObjectInfo(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
-  VectorOfObjectInfo(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+  VectorOfObjectInfo(long cPtr, NativeRef parent) {
+    super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(VectorOfObjectInfo obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_VectorOfObjectInfo(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
-  }
-
+  /** An empty vector. */
   public VectorOfObjectInfo() {
     this(OrzaVSMobileJNI.new_VectorOfObjectInfo__SWIG_0(), true);
   }
 
-  /** A vector of {@code n} default elements. */
+  /** A vector of {@code n} default elements; IllegalArgumentException when {@code n} is negative. */
   public VectorOfObjectInfo(int n) {
     this(OrzaVSMobileJNI.new_VectorOfObjectInfo__SWIG_1(n), true);
   }
 
-  @Override
-  public int size() {
-    return OrzaVSMobileJNI.VectorOfObjectInfo_size(swigCPtr, this);
-  }
-
-  public int capacity() {
-    return OrzaVSMobileJNI.VectorOfObjectInfo_capacity(swigCPtr, this);
-  }
-
-  public void reserve(int n) {
-    OrzaVSMobileJNI.VectorOfObjectInfo_reserve(swigCPtr, this, n);
+  /** An owned vector holding copies of the elements of {@code elements}. */
+  public VectorOfObjectInfo(java.util.Collection<? extends ObjectInfo> elements) {
+    this();
+    addAll(elements);
   }
 
   @Override
-  public boolean isEmpty() {
-    return OrzaVSMobileJNI.VectorOfObjectInfo_isEmpty(swigCPtr, this);
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfObjectInfo_size(cPtr, this);
   }
 
   @Override
-  public void clear() {
-    OrzaVSMobileJNI.VectorOfObjectInfo_clear(swigCPtr, this);
+  boolean nativeIsEmpty(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfObjectInfo_isEmpty(cPtr, this);
   }
 
-  /** Appends a copy of {@code x}. */
   @Override
-  public boolean add(ObjectInfo x) {
-    OrzaVSMobileJNI.VectorOfObjectInfo_add(swigCPtr, this, ObjectInfo.getCPtr(x), x);
-    return true;
+  int nativeCapacity(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfObjectInfo_capacity(cPtr, this);
   }
 
-  /** A view of element {@code i} inside this vector (not a copy). */
   @Override
-  public ObjectInfo get(int i) {
-    return new ObjectInfo(OrzaVSMobileJNI.VectorOfObjectInfo_get(swigCPtr, this, i), this);
+  void nativeReserve(long cPtr, int n) {
+    OrzaVSMobileJNI.VectorOfObjectInfo_reserve(cPtr, this, n);
   }
 
-  // A detached copy: the element copied into a vector of its own, viewed through it.
-  private static ObjectInfo copyOf(ObjectInfo o) {
-    VectorOfObjectInfo holder = new VectorOfObjectInfo();
-    holder.add(o);
-    return holder.get(0);
-  }
-
-  /** Assigns a copy of {@code x} to element {@code i}; returns the previous element. */
   @Override
-  public ObjectInfo set(int i, ObjectInfo x) {
-    ObjectInfo previous = copyOf(get(i));
-    OrzaVSMobileJNI.VectorOfObjectInfo_set(swigCPtr, this, i, ObjectInfo.getCPtr(x), x);
-    return previous;
+  ObjectInfo nativeGet(long cPtr, int i) {
+    return new ObjectInfo(OrzaVSMobileJNI.VectorOfObjectInfo_get(cPtr, this, i), nref);
+  }
+
+  @Override
+  void nativeSet(long cPtr, int i, ObjectInfo x) {
+    OrzaVSMobileJNI.VectorOfObjectInfo_set(cPtr, this, i, ObjectInfo.getCPtr(x), x);
+  }
+
+  @Override
+  void nativeAdd(long cPtr, ObjectInfo x) {
+    OrzaVSMobileJNI.VectorOfObjectInfo_add(cPtr, this, ObjectInfo.getCPtr(x), x);
+  }
+
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.VectorOfObjectInfo_clear(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_VectorOfObjectInfo(cPtr);
+  }
+
+  /** An owned copy of a record element. */
+  @Override
+  ObjectInfo detach(ObjectInfo element) {
+    return element.copy();
   }
 }

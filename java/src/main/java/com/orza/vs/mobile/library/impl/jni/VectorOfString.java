@@ -1,96 +1,81 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /**
- * A vector of strings ({@code std::vector}). Indices outside 0..size()-1 raise
- * IndexOutOfBoundsException "vector index out of range".
+ * A {@code std::vector} as a {@link java.util.List}: a vector of strings; a null element raises NullPointerException "null string".
+ * See {@link NativeList} for the rules on indices, views and copies.
  */
-public class VectorOfString extends java.util.AbstractList<String> implements java.util.RandomAccess {
-  private transient long swigCPtr;
-  protected transient boolean swigCMemOwn;
-  // The owner of a borrowed object (a field or element handed out by its parent); kept
-  // reachable so that the parent cannot be finalized while this view is in use.
-  private transient Object swigParent;
-
+public class VectorOfString extends NativeList<String> {
   public VectorOfString(long cPtr, boolean cMemoryOwn) {
-    swigCMemOwn = cMemoryOwn;
-    swigCPtr = cPtr;
+    super(cPtr, cMemoryOwn);
   }
 
-  VectorOfString(long cPtr, Object parent) {
-    this(cPtr, false);
-    swigParent = parent;
+  VectorOfString(long cPtr, NativeRef parent) {
+    super(cPtr, parent);
   }
 
+  /** The native address of {@code obj} (0 for null); IllegalStateException once it is gone. */
   public static long getCPtr(VectorOfString obj) {
-    return (obj == null) ? 0 : obj.swigCPtr;
+    return (obj == null) ? 0 : obj.nref.get();
   }
 
-  @Override
-  protected void finalize() {
-    delete();
-  }
-
-  /** Frees the native object if this proxy owns it; afterwards the proxy is unusable. */
-  public synchronized void delete() {
-    if (swigCPtr != 0) {
-      if (swigCMemOwn) {
-        swigCMemOwn = false;
-        OrzaVSMobileJNI.delete_VectorOfString(swigCPtr);
-      }
-      swigCPtr = 0;
-    }
-    swigParent = null;
-  }
-
+  /** An empty vector. */
   public VectorOfString() {
     this(OrzaVSMobileJNI.new_VectorOfString__SWIG_0(), true);
   }
 
-  /** A vector of {@code n} default elements. */
+  /** A vector of {@code n} default elements; IllegalArgumentException when {@code n} is negative. */
   public VectorOfString(int n) {
     this(OrzaVSMobileJNI.new_VectorOfString__SWIG_1(n), true);
   }
 
-  @Override
-  public int size() {
-    return OrzaVSMobileJNI.VectorOfString_size(swigCPtr, this);
-  }
-
-  public int capacity() {
-    return OrzaVSMobileJNI.VectorOfString_capacity(swigCPtr, this);
-  }
-
-  public void reserve(int n) {
-    OrzaVSMobileJNI.VectorOfString_reserve(swigCPtr, this, n);
+  /** An owned vector holding copies of the elements of {@code elements}. */
+  public VectorOfString(java.util.Collection<? extends String> elements) {
+    this();
+    addAll(elements);
   }
 
   @Override
-  public boolean isEmpty() {
-    return OrzaVSMobileJNI.VectorOfString_isEmpty(swigCPtr, this);
+  int nativeSize(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfString_size(cPtr, this);
   }
 
   @Override
-  public void clear() {
-    OrzaVSMobileJNI.VectorOfString_clear(swigCPtr, this);
-  }
-
-  /** Appends a copy of {@code x}. */
-  @Override
-  public boolean add(String x) {
-    OrzaVSMobileJNI.VectorOfString_add(swigCPtr, this, x);
-    return true;
+  boolean nativeIsEmpty(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfString_isEmpty(cPtr, this);
   }
 
   @Override
-  public String get(int i) {
-    return OrzaVSMobileJNI.VectorOfString_get(swigCPtr, this, i);
+  int nativeCapacity(long cPtr) {
+    return OrzaVSMobileJNI.VectorOfString_capacity(cPtr, this);
   }
 
-  /** Assigns a copy of {@code x} to element {@code i}; returns the previous element. */
   @Override
-  public String set(int i, String x) {
-    String previous = get(i);
-    OrzaVSMobileJNI.VectorOfString_set(swigCPtr, this, i, x);
-    return previous;
+  void nativeReserve(long cPtr, int n) {
+    OrzaVSMobileJNI.VectorOfString_reserve(cPtr, this, n);
+  }
+
+  @Override
+  String nativeGet(long cPtr, int i) {
+    return OrzaVSMobileJNI.VectorOfString_get(cPtr, this, i);
+  }
+
+  @Override
+  void nativeSet(long cPtr, int i, String x) {
+    OrzaVSMobileJNI.VectorOfString_set(cPtr, this, i, x);
+  }
+
+  @Override
+  void nativeAdd(long cPtr, String x) {
+    OrzaVSMobileJNI.VectorOfString_add(cPtr, this, x);
+  }
+
+  @Override
+  void nativeClear(long cPtr) {
+    OrzaVSMobileJNI.VectorOfString_clear(cPtr, this);
+  }
+
+  @Override
+  void deleteNative(long cPtr) {
+    OrzaVSMobileJNI.delete_VectorOfString(cPtr);
   }
 }

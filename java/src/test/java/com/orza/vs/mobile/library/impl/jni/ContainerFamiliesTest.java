@@ -3,103 +3,137 @@ package com.orza.vs.mobile.library.impl.jni;
 import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertThrowsWithMessage;
 import static org.junit.jupiter.api.Assertions.assertEquals;
 import static org.junit.jupiter.api.Assertions.assertFalse;
+import static org.junit.jupiter.api.Assertions.assertNotEquals;
+import static org.junit.jupiter.api.Assertions.assertNull;
 import static org.junit.jupiter.api.Assertions.assertThrows;
 import static org.junit.jupiter.api.Assertions.assertTrue;
 
+import java.util.ArrayList;
 import java.util.Arrays;
+import java.util.Iterator;
+import java.util.LinkedHashMap;
 import java.util.List;
+import java.util.Map;
+import java.util.TreeMap;
+import java.util.function.Function;
+import java.util.function.Supplier;
+import java.util.stream.Stream;
 import org.junit.jupiter.api.Test;
+import org.junit.jupiter.params.ParameterizedTest;
+import org.junit.jupiter.params.provider.Arguments;
+import org.junit.jupiter.params.provider.MethodSource;
 
 class ContainerFamiliesTest {
   private static final String OUT_OF_RANGE = "vector index out of range";
 
-  private static <T> void assertIndexChecked(List<T> vector, T value) {
-    int size = vector.size();
-    assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE, () -> vector.get(-1));
-    assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE, () -> vector.get(size));
-    assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE,
-        () -> vector.set(size, value));
-    assertEquals(size, vector.size());
+  /** Each vector type with a way to make an element from an int and to read it back. */
+  static Stream<Arguments> vectors() {
+    return Stream.of(
+        vector("VectorOfInt", VectorOfInt::new, i -> i, e -> e, 0),
+        vector("VectorOfDouble", VectorOfDouble::new, i -> i + 0.5, e -> (int) (e - 0.5), 0.0),
+        vector("VectorOfString", VectorOfString::new, i -> "s" + i,
+            e -> e.isEmpty() ? 0 : Integer.parseInt(e.substring(1)), ""),
+        vector("VectorOfPoint2f", VectorOfPoint2f::new, i -> new Point2f(i, -i),
+            e -> (int) e.getX(), null),
+        vector("VectorOfObjectInfo", VectorOfObjectInfo::new, i -> {
+          ObjectInfo o = new ObjectInfo(ContentType.PIDN);
+          o.setContent(Integer.toString(i));
+          return o;
+        }, e -> e.getContent().isEmpty() ? 0 : Integer.parseInt(e.getContent()), null));
+  }
+
+  static <E> Arguments vector(String name, Supplier<NativeList<E>> make, Function<Integer, E> element,
+                              Function<E, Integer> read, E defaultValue) {
+    return Arguments.of(name, make, element, read, defaultValue);
+  }
+
+  static <E> List<Integer> read(List<E> list, Function<E, Integer> read) {
+    List<Integer> out = new ArrayList<Integer>();
+    for (E e : list) out.add(read.apply(e));
+    return out;
+  }
+
+  @ParameterizedTest(name = "{0}")
+  @MethodSource("vectors")
+  <E> void vectorsAreLists(String name, Supplier<NativeList<E>> make, Function<Integer, E> element,
+                           Function<E, Integer> read, E defaultValue) {
+    try (NativeList<E> v = make.get()) {
+      assertTrue(v.isEmpty());
+      v.reserve(10);
+      assertTrue(v.capacity() >= 10);
+      for (int i = 1; i <= 3; i++) v.add(element.apply(i));
+      v.add(0, element.apply(0));
+      v.add(2, element.apply(9));
+      v.add(v.size(), element.apply(7));
+      assertEquals(Arrays.asList(0, 1, 9, 2, 3, 7), read(v, read));
+      assertEquals(9, (int) read.apply(v.remove(2)));
+      assertEquals(1, (int) read.apply(v.set(1, element.apply(5))));
+      v.add(1, v.get(3));  // an element of the vector itself, inserted before its own position
+      assertEquals(Arrays.asList(0, 3, 5, 2, 3, 7), read(v, read));
+      Iterator<E> it = v.iterator();
+      it.next();
+      it.remove();
+      v.subList(3, 5).clear();
+      assertEquals(Arrays.asList(3, 5, 2), read(v, read));
+      for (int bad : new int[] {-1, v.size()}) {
+        assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE, () -> v.get(bad));
+        assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE, () -> v.remove(bad));
+        assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE,
+            () -> v.set(bad, element.apply(1)));
+      }
+      assertThrowsWithMessage(IndexOutOfBoundsException.class, OUT_OF_RANGE,
+          () -> v.add(v.size() + 1, element.apply(1)));
+      assertEquals(3, v.size());
+
+      // Copies stand on their own: the vector may change or go.
+      List<E> copy = new ArrayList<E>(v);
+      NativeList<E> again = make.get();
+      again.addAll(copy);
+      if (defaultValue != null) {  // values: List equality; records compare by identity
+        assertEquals(copy, v);
+        assertEquals(v, again);
+        assertEquals(v.hashCode(), again.hashCode());
+        assertEquals(defaultValue, v.getClass().getConstructor(int.class).newInstance(2).get(1));
+      }
+      v.clear();
+      assertEquals(0, v.size());
+      assertEquals(Arrays.asList(3, 5, 2), read(copy, read));
+      assertEquals(Arrays.asList(3, 5, 2), read(again, read));
+      assertThrows(IllegalArgumentException.class, () -> v.reserve(-1));
+      v.delete();
+      assertThrows(IllegalStateException.class, v::size);
+    } catch (ReflectiveOperationException e) {
+      throw new AssertionError(e);
+    }
   }
 
   @Test
-  void vectorOfInt() {
-    VectorOfInt v = new VectorOfInt();
-    assertTrue(v.isEmpty());
-    v.reserve(10);
-    assertTrue(v.capacity() >= 10);
-    v.add(1);
-    v.add(2);
-    v.add(3);
-    assertEquals(2, (int) v.set(1, 20));
-    assertEquals(Arrays.asList(1, 20, 3), v);
-    assertIndexChecked(v, 9);
-    assertEquals(Arrays.asList(1, 20, 3), v);
-    v.clear();
-    assertEquals(0, v.size());
-    VectorOfInt filled = new VectorOfInt(4);
-    assertEquals(Arrays.asList(0, 0, 0, 0), filled);
+  void argumentChecksAndViewsOfRecordVectors() {
     assertThrows(IllegalArgumentException.class, () -> new VectorOfInt(-1));
-    assertThrows(IllegalArgumentException.class, () -> filled.reserve(-1));
-    v.delete();
-    filled.delete();
-  }
-
-  @Test
-  void vectorOfDoubleAndString() {
-    VectorOfDouble d = new VectorOfDouble(2);
-    d.set(0, 0.25);
-    d.add(-1e300);
-    assertEquals(Arrays.asList(0.25, 0.0, -1e300), d);
-    assertIndexChecked(d, 1.0);
-
-    VectorOfString s = new VectorOfString();
-    s.add("x");
-    s.add("\u00fc\u00df");
-    s.add("");
-    assertEquals(Arrays.asList("x", "\u00fc\u00df", ""), s);
-    assertEquals("x", s.set(0, "y"));
-    assertIndexChecked(s, "z");
+    VectorOfString s = new VectorOfString(Arrays.asList("x", "\u00fc\u00df", ""));
     assertThrowsWithMessage(NullPointerException.class, "null string", () -> s.add(null));
     assertThrowsWithMessage(NullPointerException.class, "null string", () -> s.set(0, null));
-    assertEquals(Arrays.asList("y", "\u00fc\u00df", ""), s);
-    assertEquals(Arrays.asList("", ""), new VectorOfString(2));
-    d.delete();
-    s.delete();
-  }
+    assertEquals(Arrays.asList("x", "\u00fc\u00df", ""), s);
+    assertThrowsWithMessage(NullPointerException.class,
+        "std::vector< OrzaVSMobile::Point2< float > >::value_type const & reference is null",
+        () -> new VectorOfPoint2f().add(null));
+    assertThrowsWithMessage(NullPointerException.class,
+        "std::vector< Tovra::ObjectInfo >::value_type const & reference is null",
+        () -> new VectorOfObjectInfo(1).set(0, null));
 
-  @Test
-  void vectorsOfRecordsCopyInAndViewOut() {
+    // A record element is a view: it writes into the vector, and dies when the vector grows.
     VectorOfPoint2f points = new VectorOfPoint2f();
     Point2f p = new Point2f(1, 2);
     points.add(p);
     p.setX(100);  // the vector holds its own copy
-    assertEquals(1f, points.get(0).getX());
     Point2f view = points.get(0);
-    view.setY(5);  // a view writes into the vector
+    view.setY(5);
+    assertEquals(1f, points.get(0).getX());
     assertEquals(5f, points.get(0).getY());
-    Point2f previous = points.set(0, new Point2f(9, 9));
-    assertEquals(1f, previous.getX());
-    assertEquals(9f, points.get(0).getX());
-    assertIndexChecked(points, new Point2f());
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::vector< OrzaVSMobile::Point2< float > >::value_type const & reference is null",
-        () -> points.add(null));
-
-    VectorOfObjectInfo infos = new VectorOfObjectInfo(1);
-    assertEquals(ContentType.UNSPECIFIED_CONTENT_TYPE, infos.get(0).getContentType());
-    ObjectInfo info = new ObjectInfo(ContentType.PIDN);
-    info.setContent("first");
-    infos.add(info);
-    ObjectInfo old = infos.set(1, new ObjectInfo(ContentType.SEARCH_TERMS));
-    assertEquals("first", old.getContent());
-    assertEquals(ContentType.SEARCH_TERMS, infos.get(1).getContentType());
-    assertIndexChecked(infos, info);
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::vector< Tovra::ObjectInfo >::value_type const & reference is null",
-        () -> infos.set(0, null));
-    points.delete();
-    infos.delete();
+    points.add(new Point2f());
+    IllegalStateException stale = assertThrows(IllegalStateException.class, view::getX);
+    assertTrue(stale.getMessage().contains("VectorOfPoint2f it was taken from has changed"),
+        stale.getMessage());
   }
 
   @Test
@@ -112,74 +146,92 @@ class ContainerFamiliesTest {
     root.getSubContents().add(child);
     VectorOfObjectInfo list = new VectorOfObjectInfo();
     list.add(root);
+    ObjectInfo copy = list.get(0).copy();
     root.getSubContents().get(0).getSubContents().get(0).setContent("changed");
-    assertEquals("deep", list.get(0).getSubContents().get(0).getSubContents().get(0).getContent());
+    VectorOfObjectInfo nested = list.get(0).getSubContents();
+    assertEquals("deep", nested.get(0).getSubContents().get(0).getContent());
     list.delete();
-    root.delete();
-    child.delete();
-    grandChild.delete();
+    // Views of a deleted vector, down to the nested ones, refuse to be used.
+    assertThrows(IllegalStateException.class, nested::size);
+    assertEquals("deep", copy.getSubContents().get(0).getSubContents().get(0).getContent());
+    assertEquals(ContentType.PIDN, copy.getContentType());
   }
 
-  @Test
-  void mapOfStringToString() {
-    MapOfStringToString map = new MapOfStringToString();
+  /** Each map type with a value made from an int. */
+  static Stream<Arguments> maps() {
+    return Stream.of(
+        Arguments.of("std::map< std::string,std::string > const & reference is null",
+            (Supplier<NativeMap<?>>) MapOfStringToString::new,
+            (Function<Integer, Object>) i -> "v" + i),
+        Arguments.of("std::map< std::string,unsigned int > const & reference is null",
+            (Supplier<NativeMap<?>>) MapOfStringToUInt::new, (Function<Integer, Object>) i -> (long) i),
+        Arguments.of("std::map< std::string,double > const & reference is null",
+            (Supplier<NativeMap<?>>) MapOfStringToDouble::new,
+            (Function<Integer, Object>) i -> i + 0.25));
+  }
+
+  @ParameterizedTest(name = "{0}")
+  @MethodSource("maps")
+  @SuppressWarnings("unchecked")
+  <V> void mapsAreMaps(String nullCopyMessage, Supplier<NativeMap<V>> make, Function<Integer, V> value)
+      throws ReflectiveOperationException {
+    NativeMap<V> map = make.get();
     assertTrue(map.empty());
-    map.set("b", "2");
-    map.set("a", "1");
-    map.set("b", "3");
-    assertEquals(2, map.size());
-    assertEquals("3", map.get("b"));
-    assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found", () -> map.get("c"));
-    assertFalse(map.has_key("c"));
-    assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found", () -> map.del("c"));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> map.get(null));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> map.set("k", null));
-    VectorOfString keys = map.getKeys();
-    assertEquals(Arrays.asList("a", "b"), keys);
-    keys.delete();
-    MapOfStringToString copy = new MapOfStringToString(map);
-    map.del("a");
-    assertFalse(map.has_key("a"));
-    assertTrue(copy.has_key("a"));
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::map< std::string,std::string > const & reference is null",
-        () -> new MapOfStringToString(null));
+    assertNull(map.put("b", value.apply(2)));
+    map.put("a", value.apply(1));
+    assertEquals(value.apply(2), map.put("b", value.apply(3)));
+    map.set("c", value.apply(4));
+    Map<String, V> expected = new TreeMap<String, V>();
+    expected.put("a", value.apply(1));
+    expected.put("b", value.apply(3));
+    expected.put("c", value.apply(4));
+    assertEquals(expected, map);
+    assertEquals(map, expected);
+    assertEquals(expected.hashCode(), map.hashCode());
+    assertEquals(Arrays.asList("a", "b", "c"), new ArrayList<String>(map.keySet()));
+    assertEquals(Arrays.asList("a", "b", "c"), map.getKeys());
+    assertNull(map.get("none"));
+    assertNull(map.get(7));
+    assertFalse(map.containsKey("none"));
+    assertNull(map.remove("none"));
+    assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found", () -> map.at("none"));
+    assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found", () -> map.del("none"));
+    assertThrowsWithMessage(NullPointerException.class, "null string", () -> map.at(null));
+    assertThrowsWithMessage(NullPointerException.class, "null string", () -> map.put(null, value.apply(1)));
+
+    Map.Entry<String, V> first = map.entrySet().iterator().next();
+    first.setValue(value.apply(8));
+    assertEquals(value.apply(8), map.at("a"));
+    map.entrySet().removeIf(e -> e.getKey().equals("b"));
+    assertEquals(value.apply(4), map.remove("c"));
+    assertEquals(1, map.size());
+
+    Class<?> type = map.getClass();
+    NativeMap<V> copy = (NativeMap<V>) type.getConstructor(type).newInstance(map);
+    NativeMap<V> fromJava = (NativeMap<V>) type.getConstructor(Map.class).newInstance(expected);
     map.clear();
-    VectorOfString none = map.getKeys();
-    assertTrue(none.isEmpty());
-    none.delete();
-    map.delete();
-    copy.delete();
+    assertTrue(map.isEmpty());
+    assertTrue(map.getKeys().isEmpty());
+    assertEquals(value.apply(8), copy.get("a"));
+    assertEquals(expected, fromJava);
+    assertNotEquals(map, copy);
+    Throwable e = assertThrows(java.lang.reflect.InvocationTargetException.class,
+        () -> type.getConstructor(type).newInstance((Object) null));
+    assertEquals(nullCopyMessage, e.getCause().getMessage());
+    try (NativeMap<V> closed = copy) {
+      closed.size();
+    }
+    assertThrows(IllegalStateException.class, copy::size);
   }
 
   @Test
-  void mapsOfNumbers() {
-    MapOfStringToUInt counts = new MapOfStringToUInt();
+  void numberMapsKeepTheirNativeRange() {
+    MapOfStringToUInt counts = new MapOfStringToUInt(new LinkedHashMap<String, Long>());
     counts.set("max", 4294967295L);
     counts.set("wrapped", 4294967296L + 7);  // taken modulo 2^32
-    assertEquals(4294967295L, counts.get("max"));
-    assertEquals(7L, counts.get("wrapped"));
+    assertEquals(4294967295L, (long) counts.at("max"));
+    assertEquals(7L, (long) counts.get("wrapped"));
     assertEquals(Arrays.asList("max", "wrapped"), counts.getKeysForIntMap());
-    assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found",
-        () -> counts.get("none"));
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::map< std::string,unsigned int > const & reference is null",
-        () -> new MapOfStringToUInt(null));
-
-    MapOfStringToDouble values = new MapOfStringToDouble();
-    values.set("pi", 3.25);
-    assertEquals(3.25, values.get("pi"));
-    assertTrue(values.has_key("pi"));
-    values.del("pi");
-    assertTrue(values.empty());
-    assertTrue(values.getKeysForDoubleMap().isEmpty());
-    MapOfStringToDouble copy = new MapOfStringToDouble(values);
-    assertEquals(0, copy.size());
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::map< std::string,double > const & reference is null",
-        () -> new MapOfStringToDouble(null));
-    counts.delete();
-    values.delete();
-    copy.delete();
+    assertTrue(new MapOfStringToDouble().getKeysForDoubleMap().isEmpty());
   }
 }

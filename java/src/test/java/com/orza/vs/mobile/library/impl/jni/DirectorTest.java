@@ -99,23 +99,35 @@ class DirectorTest {
     }
   }
 
+  /** Throws whatever the test hands it, from showMessage and didDecode. */
   static class Thrower extends EventDelegateBase {
-    @Override
-    public void showMessage(String message) {
-      throw new IllegalStateException("bad message: " + message);
+    volatile Throwable next;
+
+    private void fail() {
+      Throwable t = next;
+      if (t instanceof Error) throw (Error) t;
+      throw (RuntimeException) t;
     }
 
     @Override
-    public void suggestDarkScene() {
-      throw new NoStringConstructor();
+    public void showMessage(String message) {
+      fail();
+    }
+
+    @Override
+    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+      fail();
     }
   }
 
-  static class NoStringConstructor extends RuntimeException {
+  /** An application's exception with a field of its own. */
+  public static class AppError extends RuntimeException {
     private static final long serialVersionUID = 1L;
+    public final int code;
 
-    NoStringConstructor() {
-      super("made without a message constructor");
+    public AppError(String message, int code, Throwable cause) {
+      super(message, cause);
+      this.code = code;
     }
   }
 
@@ -213,23 +225,85 @@ class DirectorTest {
     metadata.delete();
   }
 
+  /** Exceptions as an application may throw them: the Java caller must get each very object. */
+  static List<Throwable> appExceptions() throws Exception {
+    // The same class loaded by a loader of its own: it cannot be found by name from the library.
+    java.net.URL jar = DirectorTest.class.getProtectionDomain().getCodeSource().getLocation();
+    ClassLoader isolated = new java.net.URLClassLoader(new java.net.URL[] {jar}, null);
+    Class<?> foreign = isolated.loadClass(AppError.class.getName());
+    assertNotSame(AppError.class, foreign);
+    return java.util.Arrays.asList(
+        new AppError("custom 42", 42, new java.io.IOException("root")),
+        new IllegalStateException(""),
+        new IllegalArgumentException((String) null),
+        new AssertionError("an Error"),
+        (Throwable) foreign.getConstructor(String.class, int.class, Throwable.class)
+            .newInstance("from another loader", 7, null));
+  }
+
   @Test
-  void javaExceptionsReturnToTheJavaCaller() {
+  void callbackExceptionsReachTheJavaCallerAsTheSameObject() throws Exception {
     Thrower t = new Thrower();
     long h = handle(t);
-    assertThrowsWithMessage(IllegalStateException.class, "bad message: hi",
-        () -> OrzaVSMobileJNI.EventDelegateBase_showMessage(h, t, "hi"));
-    // A class that cannot be built from a message comes back as a RuntimeException naming it.
-    RuntimeException e = assertThrows(RuntimeException.class,
-        () -> OrzaVSMobileJNI.EventDelegateBase_suggestDarkScene(h, t));
-    assertEquals(
-        "com/orza/vs/mobile/library/impl/jni/DirectorTest$NoStringConstructor: made without a message constructor",
-        e.getMessage());
-    // On a thread without a Java caller the exception is reported and dropped: the native
-    // caller returns normally, and the thread is detached again.
+    VectorOfObjectInfo none = new VectorOfObjectInfo();
+    ResultMetadata metadata = new ResultMetadata();
+    List<Throwable> handled = Collections.synchronizedList(new ArrayList<Throwable>());
+    OrzaVSMobile.setCallbackExceptionHandler((thread, e) -> handled.add(e));
+    try {
+      for (Throwable thrown : appExceptions()) {
+        t.next = thrown;
+        assertSame(thrown, assertThrows(Throwable.class,
+            () -> OrzaVSMobileJNI.EventDelegateBase_showMessage(h, t, "hi")));
+        assertSame(thrown, assertThrows(Throwable.class, () -> OrzaVSMobileJNI.EventDelegateBase_didDecode(
+            h, t, VectorOfObjectInfo.getCPtr(none), none, ResultMetadata.getCPtr(metadata), metadata)));
+        // No Java caller on a native thread: the application's handler gets it, the native
+        // caller returns normally and the thread is detached again.
+        assertEquals("detached-before;called;detached-after",
+            NativeTestHooks.showMessageOnNativeThread(h, "x"));
+        assertSame(thrown, handled.remove(0));
+      }
+      assertTrue(handled.isEmpty());
+    } finally {
+      OrzaVSMobile.setCallbackExceptionHandler(null);
+    }
+    assertEquals(42, ((AppError) appExceptions().get(0)).code);  // fields travel with the object
+  }
+
+  /** Keeps every borrowed argument it is given, and copies of the results. */
+  static class Keeper extends EventDelegateBase {
+    final List<Object> kept = new ArrayList<Object>();
+    List<ObjectInfo> copies;
+    ResultMetadata metadataCopy;
+
+    @Override
+    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+      copies = new ArrayList<ObjectInfo>(objects);
+      metadataCopy = metadata.copy();
+      ObjectInfo first = objects.get(0);
+      kept.addAll(java.util.Arrays.asList(objects, metadata, first, first.getLocation(),
+          first.getLocation().get(0), first.getSubContents(), metadata.getAccumulatedQueries()));
+    }
+  }
+
+  @Test
+  void borrowedArgumentsEndWithTheirCallback() {
+    Keeper k = new Keeper();
     assertEquals("detached-before;called;detached-after",
-        NativeTestHooks.showMessageOnNativeThread(h, "x"));
-    t.delete();
+        NativeTestHooks.didDecodeOnNativeThread(handle(k), 2, "q5"));
+    for (Object view : k.kept) {
+      Throwable late = assertThrows(IllegalStateException.class, () -> {
+        if (view instanceof java.util.Collection) ((java.util.Collection<?>) view).size();
+        else if (view instanceof ResultMetadata) ((ResultMetadata) view).getQueryID();
+        else if (view instanceof ObjectInfo) ((ObjectInfo) view).getContent();
+        else ((Point2f) view).getX();
+      }, view.getClass().getSimpleName());
+      assertTrue(late.getMessage().contains("lives only during the callback"), late.getMessage());
+    }
+    assertEquals(2, k.copies.size());
+    assertEquals("result-1", k.copies.get(1).getContent());
+    assertEquals(3f, k.copies.get(1).getLocation().get(2).getY() - 1f);
+    assertEquals("q5", k.metadataCopy.getQueryID());
+    assertEquals(java.util.Arrays.asList("q-1", "q-2"), k.metadataCopy.getAccumulatedQueries());
   }
 
   @Test
@@ -312,11 +386,13 @@ class DirectorTest {
 
   static class Transport extends ServerDelegate {
     final List<String> ids = Collections.synchronizedList(new ArrayList<String>());
-    volatile boolean fail;
+    volatile RuntimeException fail;
+    volatile ServerRequest last;
 
     @Override
     public boolean sendServerRequestImpl(ServerRequest request) {
-      if (fail) throw new IllegalStateException("transport down");
+      last = request;
+      if (fail != null) throw fail;
       ids.add(request.getId() + "@" + Thread.currentThread().getName());
       return true;
     }
@@ -353,15 +429,24 @@ class DirectorTest {
     assertEquals(NativeTestHooks.sendRequestOnNativeThread(h, "r-2"),
         "detached-before;result=true;detached-after");
 
-    // The transport's own exception: back to a Java caller; to a native caller as a
-    // director exception (the engine catches it).
-    t.fail = true;
-    assertThrowsWithMessage(IllegalStateException.class, "transport down",
-        () -> t.sendServerRequestImpl(request));
-    String report = NativeTestHooks.sendRequestOnNativeThread(h, "r-3");
-    assertTrue(report.startsWith("detached-before;threw="), report);
-    assertTrue(report.contains("DirectorException"), report);
-    assertTrue(report.endsWith(":transport down;detached-after"), report);
+    // A request handed to the transport is borrowed for the call only.
+    assertThrows(IllegalStateException.class, t.last::getId);
+
+    // The transport's own exception: back to a Java caller as the same object; to a native
+    // caller as a director exception (the engine catches it), and then to the handler.
+    t.fail = new IllegalStateException("transport down");
+    assertSame(t.fail, assertThrows(IllegalStateException.class, () -> t.sendServerRequest(request)));
+    List<Throwable> handled = Collections.synchronizedList(new ArrayList<Throwable>());
+    OrzaVSMobile.setCallbackExceptionHandler((thread, e) -> handled.add(e));
+    try {
+      String report = NativeTestHooks.sendRequestOnNativeThread(h, "r-3");
+      assertTrue(report.startsWith("detached-before;threw="), report);
+      assertTrue(report.contains("DirectorException"), report);
+      assertTrue(report.endsWith(":transport down;detached-after"), report);
+      assertEquals(Collections.singletonList(t.fail), handled);
+    } finally {
+      OrzaVSMobile.setCallbackExceptionHandler(null);
+    }
 
     assertThrowsWithMessage(NullPointerException.class,
         "Tovra::Server::ServerRequest const & reference is null",
@@ -377,7 +462,7 @@ class DirectorTest {
     // Through the interface proxy too.
     ServerDelegateInterface asInterface = new ServerDelegateInterface(
         OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), false);
-    t.fail = false;
+    t.fail = null;
     assertTrue(asInterface.sendServerRequest(request));
     request.delete();
     t.delete();
@@ -421,6 +506,16 @@ class DirectorTest {
         () -> subclass.sendServerRequest(request));
     assertEquals("detached-before;result=false;detached-after",
         NativeTestHooks.sendRequestOnNativeThread(ServerDelegate.getCPtr(subclass), "p"));
+    // An override calling its superclass fails at once instead of recursing into itself.
+    ServerDelegate superCaller = new ServerDelegate() {
+      @Override
+      public boolean sendServerRequestImpl(ServerRequest r) {
+        return super.sendServerRequestImpl(r);
+      }
+    };
+    assertThrowsWithMessage(UnsupportedOperationException.class, "ServerDelegate.sendServerRequestImpl "
+        + "has no implementation: an override must not call super.sendServerRequestImpl()",
+        () -> superCaller.sendServerRequest(request));
     request.delete();
     plain.delete();
     subclass.delete();

@@ -195,11 +195,6 @@ class DirectorTest {
     assertThrowsWithMessage(NullPointerException.class, "null string",
         () -> OrzaVSMobileJNI.EventDelegateBase_showMessage(h, r, null));
     assertEquals(13, r.calls.size());
-    r.delete();
-    objects.delete();
-    none.delete();
-    points.delete();
-    metadata.delete();
   }
 
   @Test
@@ -219,10 +214,6 @@ class DirectorTest {
     base.showMessage("absorbed");
     base.didReceiveEvent(ObjectModuleID.BARCODE_MOD, ContentType.PIDN, ActionID.NO_ACTION,
         StatusID.SUCCESS_STATUS);
-    d.delete();
-    base.delete();
-    objects.delete();
-    metadata.delete();
   }
 
   /** Exceptions as an application may throw them: the Java caller must get each very object. */
@@ -325,7 +316,6 @@ class DirectorTest {
     // A Java thread stays attached.
     assertTrue(NativeTestHooks.showMessageOnThisThread(h, "two"));
     assertSame(Thread.currentThread(), r.lastThread);
-    r.delete();
   }
 
   @Test
@@ -360,8 +350,6 @@ class DirectorTest {
     assertEquals("detached-before;called;detached-after",
         NativeTestHooks.showMessageOnNativeThread(h, "nobody"));
     OrzaVSMobileJNI.delete_EventDelegateBase(h);
-    objects.delete();
-    metadata.delete();
   }
 
   @Test
@@ -478,7 +466,6 @@ class DirectorTest {
         new ServerDelegateInterface(OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), true);
     owner.delete();
     assertEquals(0, ServerDelegate.getCPtr(t));
-    t.delete();
   }
 
   @Test
@@ -489,8 +476,6 @@ class DirectorTest {
     assertFalse(OrzaVSMobileJNI.ServerDelegate_sendServerRequest(ServerDelegate.getCPtr(w), w,
         ServerRequest.getCPtr(request), request));
     assertEquals(java.util.Arrays.asList("send w", "impl w"), w.seen);
-    request.delete();
-    w.delete();
   }
 
   @Test
@@ -516,8 +501,5 @@ class DirectorTest {
     assertThrowsWithMessage(UnsupportedOperationException.class, "ServerDelegate.sendServerRequestImpl "
         + "has no implementation: an override must not call super.sendServerRequestImpl()",
         () -> superCaller.sendServerRequest(request));
-    request.delete();
-    plain.delete();
-    subclass.delete();
   }
 }

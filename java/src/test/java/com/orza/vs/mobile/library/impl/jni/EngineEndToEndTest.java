@@ -35,17 +35,19 @@ class EngineEndToEndTest {
     final LinkedBlockingQueue<String> decoded = new LinkedBlockingQueue<String>();
     final List<Thread> pointThreads = Collections.synchronizedList(new ArrayList<Thread>());
     volatile int lastPointCount = -1;
-    volatile String throwFromPoints;
+    volatile RuntimeException throwFromPoints;
+    volatile RuntimeException throwFromDecode;
 
     @Override
     public void didDetectInterestPoints(VectorOfPoint2f points) {
       pointThreads.add(Thread.currentThread());
       lastPointCount = points.size();
-      if (throwFromPoints != null) throw new IllegalStateException(throwFromPoints);
+      if (throwFromPoints != null) throw throwFromPoints;
     }
 
     @Override
     public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+      if (throwFromDecode != null) throw throwFromDecode;
       StringBuilder text = new StringBuilder(Thread.currentThread().getName());
       text.append('|').append(metadata.getQueryID()).append('|')
           .append(metadata.getIsFinalAccumulation()).append('|')
@@ -74,6 +76,7 @@ class EngineEndToEndTest {
       return t;
     });
     final LinkedBlockingQueue<String> sent = new LinkedBlockingQueue<String>();
+    final LinkedBlockingQueue<Throwable> pushFailures = new LinkedBlockingQueue<Throwable>();
     volatile int code = 200;
     volatile String body = REPLY;
     volatile boolean throwOnSend;
@@ -94,7 +97,6 @@ class EngineEndToEndTest {
         } else {
           pushServerResponse(response);
         }
-        response.delete();
         return true;
       }
       // The request is borrowed: copy what is needed before returning.
@@ -111,8 +113,11 @@ class EngineEndToEndTest {
         response.setResponseCode(replyCode);
         response.setResponseStr(replyBody);
         response.setRoundtripTime(0.01);
-        pushServerResponse(response);
-        response.delete();
+        try {
+          pushServerResponse(response);
+        } catch (RuntimeException e) {
+          pushFailures.add(e);
+        }
       });
       return true;
     }
@@ -133,14 +138,10 @@ class EngineEndToEndTest {
 
   @AfterEach
   void tearDown() throws Exception {
-    engine.stopEngine();
-    engine.delete();
+    engine.close();
+    engine.close();  // once only
     transport.executor.shutdown();
     assertTrue(transport.executor.awaitTermination(5, TimeUnit.SECONDS));
-    transport.delete();
-    events.delete();
-    image.delete();
-    extra.delete();
   }
 
   /** A densely textured NV21 frame (a fixed pseudo-random pattern), shifted by {@code shift}. */
@@ -206,6 +207,16 @@ class EngineEndToEndTest {
     }
     assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS));
     assertEquals("transport|error VISUAL_SEARCH_SERVICE_MOD RESPONSE_SERVER_ERROR 500", nextEvent());
+
+    // A failing didDecode: the transport's pushServerResponse throws that very exception.
+    transport.code = 200;
+    transport.body = REPLY;
+    events.throwFromDecode = new IllegalStateException("app failure", new Error("cause"));
+    for (int i = 0; i < 20 && transport.sent.isEmpty(); i++) {
+      streamFrame();
+      Thread.sleep(20);
+    }
+    assertSame(events.throwFromDecode, transport.pushFailures.poll(10, TimeUnit.SECONDS));
   }
 
   @Test
@@ -251,7 +262,6 @@ class EngineEndToEndTest {
     own.setHeight(HEIGHT * 4);
     engine.process(own, extra);
     assertEquals(1, events.pointThreads.size());
-    own.delete();
   }
 
   @Test
@@ -272,10 +282,10 @@ class EngineEndToEndTest {
   @Test
   void aThrowingCallbackReturnsToTheCallerAndTheEngineGoesOn() throws Exception {
     engine.startEngine();
-    events.throwFromPoints = "no thanks";
+    events.throwFromPoints = new IllegalStateException("no thanks");
     // More frames than the engine has records: a lent buffer must not be lost per exception.
     for (int i = 0; i < 8; i++) {
-      assertThrowsWithMessage(IllegalStateException.class, "no thanks", this::streamFrame);
+      assertSame(events.throwFromPoints, assertThrows(IllegalStateException.class, this::streamFrame));
     }
     events.throwFromPoints = null;
     streamFrame();
@@ -296,7 +306,6 @@ class EngineEndToEndTest {
     String event = events.decoded.poll();
     assertNotNull(event, "the reply was handled before processSingleImage returned");
     assertTrue(event.startsWith("transport|q-1|"), event);
-    still.delete();
   }
 
   @Test
@@ -396,9 +405,6 @@ class EngineEndToEndTest {
     TovraStateEngineFacade other = new TovraStateEngineFacade(null);
     other.delete();
     assertThrows(NullPointerException.class, other::startEngine);
-    requirement.delete();
-    counts.delete();
-    values.delete();
-    props.delete();
+    other.close();
   }
 }

@@ -17,29 +17,46 @@ import java.util.List;
 import org.junit.jupiter.api.Test;
 
 class DirectorTest {
-  /** Records every callback with its arguments and thread. */
+  /**
+   * Records every callback with its arguments and thread; keeps what didDecode was lent, and
+   * copies of it; throws {@code next} (when set) from showMessage and didDecode.
+   */
   static class Recorder extends EventDelegateBase {
     final List<String> calls = Collections.synchronizedList(new ArrayList<String>());
     volatile Thread lastThread;
+    volatile Throwable next;
+    final List<Object> lent = new ArrayList<Object>();
+    List<ObjectInfo> copies;
+    ResultMetadata metadataCopy;
 
     private void record(String call) {
       lastThread = Thread.currentThread();
       calls.add(call);
+      Throwable t = next;
+      if (t instanceof Error) throw (Error) t;
+      if (t != null && (call.startsWith("message") || call.startsWith("decode"))) throw (RuntimeException) t;
     }
 
-    @Override
-    public void didReceiveEvent(ObjectModuleID m, ContentType c, ActionID a, StatusID s) {
+    // One line each: these overrides only make the callbacks visible.
+    @Override public void didReceiveEvent(ObjectModuleID m, ContentType c, ActionID a, StatusID s) {
       record("event " + m + " " + c + " " + a + " " + s);
     }
-
-    @Override
-    public void didProcessFrame(ObjectModuleID m, StatusID s, long v64, int v32) {
+    @Override public void didProcessFrame(ObjectModuleID m, StatusID s, long v64, int v32) {
       record("frame " + m + " " + s + " " + v64 + " " + v32);
     }
-
-    @Override
-    public void didDetect(VectorOfObjectInfo objects) {
-      record("detect " + objects.size());
+    @Override public void didDetect(VectorOfObjectInfo objects) { record("detect " + objects.size()); }
+    @Override public void didDetectInterestPoints(VectorOfPoint2f points) { record("points " + points.size()); }
+    @Override public void didReceiveServerError(ObjectModuleID m, ResponseStatus s, int code) {
+      record("error " + m + " " + s + " " + code);
+    }
+    @Override public void suggestDarkScene() { record("dark"); }
+    @Override public void suggestBoringEvent() { record("boring"); }
+    @Override public void showMessage(String message) { record("message [" + message + "]"); }
+    @Override public void didProcessFrameDecision(CameraStabilityIssue issue, double value) {
+      record("decision " + issue + " " + value);
+    }
+    @Override public void didProcessModuleDecision(ObjectModuleID m, JudgeVerdictOnModule verdict) {
+      record("module " + m + " " + verdict);
     }
 
     @Override
@@ -49,43 +66,16 @@ class DirectorTest {
         text.append(' ').append(o.getContent()).append('/').append(o.getContentType())
             .append('/').append(o.getLocation().size());
       }
-      text.append(' ').append(metadata.getAccumulatedQueries());
-      record(text.toString());
-    }
-
-    @Override
-    public void didDetectInterestPoints(VectorOfPoint2f points) {
-      record("points " + points.size());
-    }
-
-    @Override
-    public void didReceiveServerError(ObjectModuleID m, ResponseStatus s, int code) {
-      record("error " + m + " " + s + " " + code);
-    }
-
-    @Override
-    public void suggestDarkScene() {
-      record("dark");
-    }
-
-    @Override
-    public void suggestBoringEvent() {
-      record("boring");
-    }
-
-    @Override
-    public void showMessage(String message) {
-      record("message [" + message + "]");
-    }
-
-    @Override
-    public void didProcessFrameDecision(CameraStabilityIssue issue, double value) {
-      record("decision " + issue + " " + value);
-    }
-
-    @Override
-    public void didProcessModuleDecision(ObjectModuleID m, JudgeVerdictOnModule verdict) {
-      record("module " + m + " " + verdict);
+      copies = new ArrayList<ObjectInfo>(objects);
+      metadataCopy = metadata.copy();
+      lent.clear();
+      lent.addAll(java.util.Arrays.asList(objects, metadata, metadata.getAccumulatedQueries()));
+      if (!objects.isEmpty()) {
+        ObjectInfo first = objects.get(0);
+        lent.addAll(java.util.Arrays.asList(first, first.getLocation(), first.getLocation().get(0),
+            first.getSubContents()));
+      }
+      record(text.append(' ').append(metadata.getAccumulatedQueries()).toString());
     }
   }
 
@@ -96,27 +86,6 @@ class DirectorTest {
     @Override
     public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
       calls.add("decode " + objects.size());
-    }
-  }
-
-  /** Throws whatever the test hands it, from showMessage and didDecode. */
-  static class Thrower extends EventDelegateBase {
-    volatile Throwable next;
-
-    private void fail() {
-      Throwable t = next;
-      if (t instanceof Error) throw (Error) t;
-      throw (RuntimeException) t;
-    }
-
-    @Override
-    public void showMessage(String message) {
-      fail();
-    }
-
-    @Override
-    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
-      fail();
     }
   }
 
@@ -234,7 +203,7 @@ class DirectorTest {
 
   @Test
   void callbackExceptionsReachTheJavaCallerAsTheSameObject() throws Exception {
-    Thrower t = new Thrower();
+    Recorder t = new Recorder();
     long h = handle(t);
     VectorOfObjectInfo none = new VectorOfObjectInfo();
     ResultMetadata metadata = new ResultMetadata();
@@ -257,31 +226,15 @@ class DirectorTest {
     } finally {
       OrzaVSMobile.setCallbackExceptionHandler(null);
     }
-    assertEquals(42, ((AppError) appExceptions().get(0)).code);  // fields travel with the object
-  }
-
-  /** Keeps every borrowed argument it is given, and copies of the results. */
-  static class Keeper extends EventDelegateBase {
-    final List<Object> kept = new ArrayList<Object>();
-    List<ObjectInfo> copies;
-    ResultMetadata metadataCopy;
-
-    @Override
-    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
-      copies = new ArrayList<ObjectInfo>(objects);
-      metadataCopy = metadata.copy();
-      ObjectInfo first = objects.get(0);
-      kept.addAll(java.util.Arrays.asList(objects, metadata, first, first.getLocation(),
-          first.getLocation().get(0), first.getSubContents(), metadata.getAccumulatedQueries()));
-    }
   }
 
   @Test
   void borrowedArgumentsEndWithTheirCallback() {
-    Keeper k = new Keeper();
+    Recorder k = new Recorder();
     assertEquals("detached-before;called;detached-after",
         NativeTestHooks.didDecodeOnNativeThread(handle(k), 2, "q5"));
-    for (Object view : k.kept) {
+    assertEquals(7, k.lent.size());
+    for (Object view : k.lent) {
       Throwable late = assertThrows(IllegalStateException.class, () -> {
         if (view instanceof java.util.Collection) ((java.util.Collection<?>) view).size();
         else if (view instanceof ResultMetadata) ((ResultMetadata) view).getQueryID();
@@ -445,50 +398,26 @@ class DirectorTest {
     ServerResponse unknown = new ServerResponse();
     unknown.setId("never-sent");
     t.pushServerResponse(unknown);  // ignored
-    unknown.delete();
-
-    // Through the interface proxy too.
-    ServerDelegateInterface asInterface = new ServerDelegateInterface(
-        OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), false);
-    t.fail = null;
-    assertTrue(asInterface.sendServerRequest(request));
-    request.delete();
-    t.delete();
+    t.close();
     assertEquals(0, ServerDelegate.getCPtr(t));
   }
 
   @Test
-  void destroyingThroughTheInterfaceDisconnectsTheJavaTransport() {
-    Transport t = new Transport();
-    long h = ServerDelegate.getCPtr(t);
-    t.swigReleaseOwnership();
-    ServerDelegateInterface owner =
-        new ServerDelegateInterface(OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), true);
-    owner.delete();
-    assertEquals(0, ServerDelegate.getCPtr(t));
-  }
-
-  @Test
-  void overridingSendServerRequestWrapsTheBase() {
-    Wrapping w = new Wrapping();
+  void serverDelegateVariants() {
     ServerRequest request = new ServerRequest();
     request.setId("w");
+    // Overriding sendServerRequest wraps the base, which still reaches the Impl override.
+    Wrapping w = new Wrapping();
     assertFalse(OrzaVSMobileJNI.ServerDelegate_sendServerRequest(ServerDelegate.getCPtr(w), w,
         ServerRequest.getCPtr(request), request));
     assertEquals(java.util.Arrays.asList("send w", "impl w"), w.seen);
-  }
 
-  @Test
-  void transportWithoutImplementationFailsEveryRequest() {
-    ServerDelegate plain = new ServerDelegate();
-    ServerRequest request = new ServerRequest();
-    assertThrowsWithMessage(RuntimeException.class,
-        "Attempted to invoke pure virtual method Tovra::Server::ServerDelegate::sendServerRequestImpl.",
-        () -> plain.sendServerRequest(request));
+    // Without an Impl every request fails with the pure-virtual error (false to a native caller).
+    String pureVirtual =
+        "Attempted to invoke pure virtual method Tovra::Server::ServerDelegate::sendServerRequestImpl.";
+    assertThrowsWithMessage(RuntimeException.class, pureVirtual, () -> new ServerDelegate().sendServerRequest(request));
     ServerDelegate subclass = new ServerDelegate() {};
-    assertThrowsWithMessage(RuntimeException.class,
-        "Attempted to invoke pure virtual method Tovra::Server::ServerDelegate::sendServerRequestImpl.",
-        () -> subclass.sendServerRequest(request));
+    assertThrowsWithMessage(RuntimeException.class, pureVirtual, () -> subclass.sendServerRequest(request));
     assertEquals("detached-before;result=false;detached-after",
         NativeTestHooks.sendRequestOnNativeThread(ServerDelegate.getCPtr(subclass), "p"));
     // An override calling its superclass fails at once instead of recursing into itself.
@@ -501,5 +430,15 @@ class DirectorTest {
     assertThrowsWithMessage(UnsupportedOperationException.class, "ServerDelegate.sendServerRequestImpl "
         + "has no implementation: an override must not call super.sendServerRequestImpl()",
         () -> superCaller.sendServerRequest(request));
+
+    // Destroying through the interface disconnects the Java transport.
+    Transport t = new Transport();
+    long h = ServerDelegate.getCPtr(t);
+    t.swigReleaseOwnership();
+    try (ServerDelegateInterface owner =
+             new ServerDelegateInterface(OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), true)) {
+      assertTrue(owner.sendServerRequest(request));
+    }
+    assertEquals(0, ServerDelegate.getCPtr(t));
   }
 }

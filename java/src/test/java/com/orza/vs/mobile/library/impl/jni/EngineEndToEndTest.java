@@ -79,13 +79,13 @@ class EngineEndToEndTest {
     final LinkedBlockingQueue<Throwable> pushFailures = new LinkedBlockingQueue<Throwable>();
     volatile int code = 200;
     volatile String body = REPLY;
-    volatile boolean throwOnSend;
+    volatile RuntimeException throwOnSend;
     volatile boolean answerAtOnce;
     volatile boolean answerThroughHandler;
 
     @Override
     public boolean sendServerRequestImpl(ServerRequest request) {
-      if (throwOnSend) throw new IllegalStateException("offline");
+      if (throwOnSend != null) throw throwOnSend;
       if (answerAtOnce || answerThroughHandler) {
         // Answer on the calling thread (the engine's worker), before returning.
         ServerResponse response = new ServerResponse();
@@ -171,6 +171,29 @@ class EngineEndToEndTest {
     return key[0];
   }
 
+  /** Streams frames until the transport got a request, and takes that request. */
+  String streamUntilSent() throws InterruptedException {
+    for (int i = 0; i < 50 && transport.sent.isEmpty(); i++) {
+      streamFrame();
+      Thread.sleep(20);
+    }
+    String sent = transport.sent.poll(10, TimeUnit.SECONDS);
+    assertNotNull(sent, "no request reached the transport");
+    return sent;
+  }
+
+  /** An image in memory of its own holding the test frame. */
+  ImageBuffer ownFrame() {
+    ImageBuffer own = new ImageBuffer();
+    own.setFormat(ImageFormat.NV21);
+    own.setWidth(WIDTH);
+    own.setHeight(HEIGHT);
+    own.setWidthStep(WIDTH);
+    own.allocateBuffer(frame.capacity());
+    assertEquals(frame.capacity(), own.fillBufferWithByteBuffer(frame, frame.capacity()));
+    return own;
+  }
+
   String nextEvent() throws InterruptedException {
     String event = events.decoded.poll(10, TimeUnit.SECONDS);
     assertNotNull(event, "no callback within 10 s");
@@ -180,9 +203,7 @@ class EngineEndToEndTest {
   @Test
   void framesGoOutAndResultsComeBackThroughJava() throws Exception {
     engine.startEngine();
-    streamFrame();
-    String sent = transport.sent.poll(10, TimeUnit.SECONDS);
-    assertNotNull(sent, "no request reached the transport");
+    String sent = streamUntilSent();
     String[] parts = sent.split("\\|");
     assertTrue(parts[0].startsWith("TovraStateEngine-"), sent);
     assertEquals("true", parts[1], "the body is a JPEG");
@@ -201,21 +222,14 @@ class EngineEndToEndTest {
     // A failed exchange reaches the delegate as a server error.
     transport.code = 500;
     transport.body = "internal error";
-    for (int i = 0; i < 20 && transport.sent.isEmpty(); i++) {
-      streamFrame();
-      Thread.sleep(20);
-    }
-    assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS));
+    streamUntilSent();
     assertEquals("transport|error VISUAL_SEARCH_SERVICE_MOD RESPONSE_SERVER_ERROR 500", nextEvent());
 
     // A failing didDecode: the transport's pushServerResponse throws that very exception.
     transport.code = 200;
     transport.body = REPLY;
     events.throwFromDecode = new IllegalStateException("app failure", new Error("cause"));
-    for (int i = 0; i < 20 && transport.sent.isEmpty(); i++) {
-      streamFrame();
-      Thread.sleep(20);
-    }
+    streamUntilSent();
     assertSame(events.throwFromDecode, transport.pushFailures.poll(10, TimeUnit.SECONDS));
   }
 
@@ -223,9 +237,7 @@ class EngineEndToEndTest {
   void aTransportAnsweringOnTheWorkerDeliversResultsThere() throws Exception {
     transport.answerAtOnce = true;
     engine.startEngine();
-    streamFrame();
-    String sent = transport.sent.poll(10, TimeUnit.SECONDS);
-    assertNotNull(sent);
+    String sent = streamUntilSent();
     String event = nextEvent();
     String worker = sent.substring(sent.lastIndexOf('|') + 1);
     assertTrue(event.startsWith(worker + "|q-1|true|"), event + " / " + sent);
@@ -234,11 +246,7 @@ class EngineEndToEndTest {
     // The response handler of a request can be called directly as well.
     transport.answerAtOnce = false;
     transport.answerThroughHandler = true;
-    for (int i = 0; i < 50 && transport.sent.isEmpty(); i++) {
-      streamFrame();
-      Thread.sleep(20);
-    }
-    assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS));
+    streamUntilSent();
     assertTrue(nextEvent().contains("|q-1|true|"));
     ServerResponseHandler none = new ServerResponseHandler(0, false);
     assertThrows(NullPointerException.class, () -> none.handleServerResponse(new ServerResponse()));
@@ -247,13 +255,7 @@ class EngineEndToEndTest {
   @Test
   void framesInTheCallersOwnMemory() {
     engine.startEngine();
-    ImageBuffer own = new ImageBuffer();
-    own.setFormat(ImageFormat.NV21);
-    own.setWidth(WIDTH);
-    own.setHeight(HEIGHT);
-    own.setWidthStep(WIDTH);
-    own.allocateBuffer(frame.capacity());
-    own.fillBufferWithByteBuffer(frame, frame.capacity());
+    ImageBuffer own = ownFrame();
     extra.setTimeStamp(time += 0.2);
     engine.process(own, extra);
     assertEquals(1, events.pointThreads.size());
@@ -266,17 +268,20 @@ class EngineEndToEndTest {
 
   @Test
   void aThrowingTransportDoesNotStopTheEngine() throws Exception {
-    engine.startEngine();
-    transport.throwOnSend = true;
-    streamFrame();
-    Thread.sleep(300);  // the worker tries to send, fails, and gives the frame up
-    transport.throwOnSend = false;
-    for (int i = 0; i < 50 && transport.sent.isEmpty(); i++) {
+    LinkedBlockingQueue<Throwable> handled = new LinkedBlockingQueue<Throwable>();
+    OrzaVSMobile.setCallbackExceptionHandler((thread, e) -> handled.add(e));
+    try {
+      engine.startEngine();
+      transport.throwOnSend = new IllegalStateException("offline");
       streamFrame();
-      Thread.sleep(20);
+      // On the worker no Java caller waits: the application's handler gets the exception.
+      assertSame(transport.throwOnSend, handled.poll(10, TimeUnit.SECONDS));
+      transport.throwOnSend = null;
+      streamUntilSent();
+      assertTrue(nextEvent().startsWith("transport|q-1|"));
+    } finally {
+      OrzaVSMobile.setCallbackExceptionHandler(null);
     }
-    assertNotNull(transport.sent.poll(10, TimeUnit.SECONDS), "the engine sends again");
-    assertTrue(nextEvent().startsWith("transport|q-1|"));
   }
 
   @Test
@@ -295,13 +300,7 @@ class EngineEndToEndTest {
   @Test
   void singleImageReturnsAfterItsReplyWasHandled() throws Exception {
     engine.startEngine();
-    ImageBuffer still = new ImageBuffer();
-    still.setFormat(ImageFormat.NV21);
-    still.setWidth(WIDTH);
-    still.setHeight(HEIGHT);
-    still.setWidthStep(WIDTH);
-    still.allocateBuffer(frame.capacity());
-    assertEquals(frame.capacity(), still.fillBufferWithByteBuffer(frame, frame.capacity()));
+    ImageBuffer still = ownFrame();
     engine.processSingleImage(still, extra);
     String event = events.decoded.poll();
     assertNotNull(event, "the reply was handled before processSingleImage returned");

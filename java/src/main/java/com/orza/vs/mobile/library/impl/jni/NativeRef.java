@@ -17,8 +17,11 @@ package com.orza.vs.mobile.library.impl.jni;
 final class NativeRef {
   private final long cPtr;
   private boolean owned;
-  // Why the object can no longer be used; null while it can.
+  // Why the object can no longer be used (one of the constants below); null while it can. The
+  // message is built only when it is needed: ending a borrow happens on every callback.
   private String ended;
+  private static final String DELETED = "deleted";
+  private static final String BORROW_ENDED = "borrow ended";
   // For a view: the object it lives in, and that object's generation when the view was taken.
   private final NativeRef parent;
   private final int parentGeneration;
@@ -53,11 +56,11 @@ final class NativeRef {
   }
 
   private void check() {
-    if (ended != null) throw new IllegalStateException(ended);
+    if (ended != null) throw new IllegalStateException(endedMessage());
     for (NativeRef child = this, up = parent; up != null; child = up, up = up.parent) {
       if (up.ended != null) {
         throw new IllegalStateException(type() + " is part of another object that is no longer usable: "
-            + up.ended);
+            + up.endedMessage());
       }
       if (up.generation != child.parentGeneration) {
         throw new IllegalStateException(type() + " is no longer valid: the " + up.type()
@@ -88,27 +91,30 @@ final class NativeRef {
     return false;
   }
 
+  private String endedMessage() {
+    if (ended == BORROW_ENDED) {
+      return type() + " lives only during the callback that received it; copy what you keep"
+          + " (new ArrayList<>(list), copy())";
+    }
+    return type() + " has been deleted";
+  }
+
   /**
-   * Ends the object with {@code reason} (the first reason stays). Returns the address that the
-   * caller must now free, or 0 when the proxy does not own it or it had ended already.
+   * Deletion by the proxy's owner (or its finalizer): the object is unusable afterwards. Returns
+   * the address that the caller must now free, or 0 when the proxy does not own it or it had
+   * ended already.
    */
-  synchronized long end(String reason) {
+  synchronized long endDeleted() {
     if (ended != null) return 0;
-    ended = reason;
+    ended = DELETED;
     boolean free = owned;
     owned = false;
     return free ? cPtr : 0;
   }
 
-  /** Deletion by the proxy's owner: the object is freed if owned, and unusable afterwards. */
-  long endDeleted() {
-    return end(type() + " has been deleted");
-  }
-
-  /** The end of a callback: the argument it lent is gone. */
+  /** The end of a callback: the argument it lent (never owned) is gone. */
   void endBorrow() {
-    end(type() + " lives only during the callback that received it; copy what you keep"
-        + " (new ArrayList<>(list), copy())");
+    if (ended == null) ended = BORROW_ENDED;
   }
 
   /** Java stops owning the object (native code frees it). */

@@ -360,18 +360,7 @@ class EngineEndToEndTest {
     engine.getAndClearMetrics(counts, values);
     assertEquals(3L, counts.get("frames"));
     assertTrue(values.empty());
-    MapOfStringToString props = new MapOfStringToString();
-    engine.readProps("x");
-    engine.readObjectModuleProps(ObjectModuleID.BARCODE_MOD, "y");
-    engine.readObjectModuleProps(props);
-    engine.addObjectModule(ObjectModuleID.BARCODE_MOD, props);
     engine.addObjectModule(ObjectModuleID.BARCODE_MOD, transport, "z");
-    engine.enableSingleImageMode();
-    engine.disableSingleImageMode();
-    engine.enableEventLogging();
-    engine.saveEventLog("/nonexistent/log");
-    engine.removeObjectModule(ObjectModuleID.BARCODE_MOD);
-    engine.removeAllObjectModules();
     engine.pauseEngine();
     engine.resumeEngine();
 

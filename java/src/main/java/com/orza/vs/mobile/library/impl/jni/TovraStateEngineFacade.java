@@ -13,9 +13,10 @@ package com.orza.vs.mobile.library.impl.jni;
  *   image.fillBufferWithByteBuffer(frame, size);  // a direct ByteBuffer
  *   engine.process(key[0], image, extra);
  *   // ...
- *   engine.stopEngine();
- *   engine.delete();
+ *   engine.close();                               // stops the engine, then deletes it
  * </pre>
+ *
+ * <p>The facade is {@link AutoCloseable}: {@code try (TovraStateEngineFacade engine = ...)}.
  *
  * <p>Delegates: while the engine lives, this proxy holds the event delegate and every transport
  * given to it, and owns their native objects, so that neither a collection nor a finalizer

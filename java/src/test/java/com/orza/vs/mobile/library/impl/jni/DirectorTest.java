@@ -79,16 +79,6 @@ class DirectorTest {
     }
   }
 
-  /** Overrides didDecode only. */
-  static class DecodeOnly extends EventDelegateBase {
-    final List<String> calls = new ArrayList<String>();
-
-    @Override
-    public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
-      calls.add("decode " + objects.size());
-    }
-  }
-
   /** An application's exception with a field of its own. */
   public static class AppError extends RuntimeException {
     private static final long serialVersionUID = 1L;
@@ -168,14 +158,20 @@ class DirectorTest {
 
   @Test
   void onlyOverriddenOperationsGoToJava() {
-    DecodeOnly d = new DecodeOnly();
+    List<String> calls = new ArrayList<String>();
+    EventDelegateBase d = new EventDelegateBase() {  // overrides didDecode only
+      @Override
+      public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
+        calls.add("decode " + objects.size());
+      }
+    };
     long h = handle(d);
     VectorOfObjectInfo objects = new VectorOfObjectInfo(1);
     ResultMetadata metadata = new ResultMetadata();
     OrzaVSMobileJNI.EventDelegateBase_didDetect(h, d, VectorOfObjectInfo.getCPtr(objects), objects);
     OrzaVSMobileJNI.EventDelegateBase_didDecode(h, d, VectorOfObjectInfo.getCPtr(objects), objects,
         ResultMetadata.getCPtr(metadata), metadata);
-    assertEquals(java.util.Collections.singletonList("decode 1"), d.calls);
+    assertEquals(Collections.singletonList("decode 1"), calls);
 
     // The proxy class itself overrides nothing: every call is absorbed natively.
     EventDelegateBase base = new EventDelegateBase();
@@ -229,12 +225,24 @@ class DirectorTest {
   }
 
   @Test
-  void borrowedArgumentsEndWithTheirCallback() {
-    Recorder k = new Recorder();
+  void nativeThreadsAreAttachedForOneUpcallAndBorrowedArgumentsEndWithIt() throws Exception {
+    Recorder r = new Recorder();
+    long h = handle(r);
     assertEquals("detached-before;called;detached-after",
-        NativeTestHooks.didDecodeOnNativeThread(handle(k), 2, "q5"));
-    assertEquals(7, k.lent.size());
-    for (Object view : k.lent) {
+        NativeTestHooks.showMessageOnNativeThread(h, "one"));
+    Thread first = r.lastThread;
+    assertEquals("detached-before;called;detached-after",
+        NativeTestHooks.didDecodeOnNativeThread(h, 2, "q9"));
+    assertNotSame(Thread.currentThread(), first);
+    assertNotSame(first, r.lastThread);
+    first.join(5000);
+    assertFalse(first.isAlive(), "a thread attached for an upcall is detached after it");
+    assertEquals(java.util.Arrays.asList("message [one]",
+        "decode q9 result-0/BOUNDING_BOX/4 result-1/BOUNDING_BOX/4 [q-1, q-2]"), r.calls);
+
+    // What the callback was lent is gone; its copies stay.
+    assertEquals(7, r.lent.size());
+    for (Object view : r.lent) {
       Throwable late = assertThrows(IllegalStateException.class, () -> {
         if (view instanceof java.util.Collection) ((java.util.Collection<?>) view).size();
         else if (view instanceof ResultMetadata) ((ResultMetadata) view).getQueryID();
@@ -243,29 +251,11 @@ class DirectorTest {
       }, view.getClass().getSimpleName());
       assertTrue(late.getMessage().contains("lives only during the callback"), late.getMessage());
     }
-    assertEquals(2, k.copies.size());
-    assertEquals("result-1", k.copies.get(1).getContent());
-    assertEquals(3f, k.copies.get(1).getLocation().get(2).getY() - 1f);
-    assertEquals("q5", k.metadataCopy.getQueryID());
-    assertEquals(java.util.Arrays.asList("q-1", "q-2"), k.metadataCopy.getAccumulatedQueries());
-  }
+    assertEquals("result-1", r.copies.get(1).getContent());
+    assertEquals(4f, r.copies.get(1).getLocation().get(2).getY());
+    assertEquals("q9", r.metadataCopy.getQueryID());
+    assertEquals(java.util.Arrays.asList("q-1", "q-2"), r.metadataCopy.getAccumulatedQueries());
 
-  @Test
-  void nativeThreadsAreAttachedForOneUpcallOnly() throws Exception {
-    Recorder r = new Recorder();
-    long h = handle(r);
-    assertEquals("detached-before;called;detached-after",
-        NativeTestHooks.showMessageOnNativeThread(h, "one"));
-    Thread first = r.lastThread;
-    assertEquals("detached-before;called;detached-after",
-        NativeTestHooks.didDecodeOnNativeThread(h, 2, "q9"));
-    Thread second = r.lastThread;
-    assertNotSame(Thread.currentThread(), first);
-    assertNotSame(first, second);
-    first.join(5000);
-    assertFalse(first.isAlive(), "a thread attached for an upcall is detached after it");
-    assertEquals(java.util.Arrays.asList("message [one]",
-        "decode q9 result-0/BOUNDING_BOX/4 result-1/BOUNDING_BOX/4 [q-1, q-2]"), r.calls);
     // A Java thread stays attached.
     assertTrue(NativeTestHooks.showMessageOnThisThread(h, "two"));
     assertSame(Thread.currentThread(), r.lastThread);
@@ -339,22 +329,6 @@ class DirectorTest {
     }
   }
 
-  static class Wrapping extends ServerDelegate {
-    final List<String> seen = new ArrayList<String>();
-
-    @Override
-    public boolean sendServerRequest(ServerRequest request) {
-      seen.add("send " + request.getId());
-      return super.sendServerRequest(request);
-    }
-
-    @Override
-    public boolean sendServerRequestImpl(ServerRequest request) {
-      seen.add("impl " + request.getId());
-      return false;
-    }
-  }
-
   @Test
   void serverDelegateReachesTheJavaTransport() {
     Transport t = new Transport();
@@ -407,10 +381,23 @@ class DirectorTest {
     ServerRequest request = new ServerRequest();
     request.setId("w");
     // Overriding sendServerRequest wraps the base, which still reaches the Impl override.
-    Wrapping w = new Wrapping();
+    List<String> seen = new ArrayList<String>();
+    ServerDelegate w = new ServerDelegate() {
+      @Override
+      public boolean sendServerRequest(ServerRequest r) {
+        seen.add("send " + r.getId());
+        return super.sendServerRequest(r);
+      }
+
+      @Override
+      public boolean sendServerRequestImpl(ServerRequest r) {
+        seen.add("impl " + r.getId());
+        return false;
+      }
+    };
     assertFalse(OrzaVSMobileJNI.ServerDelegate_sendServerRequest(ServerDelegate.getCPtr(w), w,
         ServerRequest.getCPtr(request), request));
-    assertEquals(java.util.Arrays.asList("send w", "impl w"), w.seen);
+    assertEquals(java.util.Arrays.asList("send w", "impl w"), seen);
 
     // Without an Impl every request fails with the pure-virtual error (false to a native caller).
     String pureVirtual =

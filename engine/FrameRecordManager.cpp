@@ -10,7 +10,7 @@ FrameRecordManager::FrameRecordManager(size_t count) {
 }
 
 std::shared_ptr<FrameRecord> FrameRecordManager::getNewSlot() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   for (auto& slot : slots_) {
     if (slot && slot.use_count() == 1) {
       // Take the new reference before touching the record. use_count() is a relaxed read;
@@ -27,7 +27,7 @@ std::shared_ptr<FrameRecord> FrameRecordManager::getNewSlot() {
 }
 
 bool FrameRecordManager::restart() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   for (auto& slot : slots_) {
     if (slot && slot.use_count() != 1) {
       std::puts("Unable to restart frame record manager () as some frame(s) are still outstanding");

@@ -95,7 +95,7 @@ void TovraStateEngine::reset() {
 }
 
 void TovraStateEngine::startEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if ((state_ | 2) != 2) return;  // only from STOPPED or PAUSED
   reset();
   auto fresh = std::make_unique<TovraExecutionEngine>(1);
@@ -106,7 +106,7 @@ void TovraStateEngine::startEngine() {
 }
 
 void TovraStateEngine::stopEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ == STOPPED) return;
   reset();
   std::unique_ptr<TovraExecutionEngine> old = std::move(executor_);
@@ -115,14 +115,14 @@ void TovraStateEngine::stopEngine() {
 }
 
 void TovraStateEngine::pauseEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) return;
   reset();
   state_ = PAUSED;
 }
 
 void TovraStateEngine::resumeEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != PAUSED) return;
   if (executor_) executor_->resumeJobs();
   state_ = RUNNING;
@@ -194,7 +194,7 @@ bool TovraStateEngine::acceptsGeometry(const ImageBuffer& image, bool packedAllo
 }
 
 void TovraStateEngine::requestImageBuffer(ImageBuffer& buffer, std::string& frameKey) {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) {
     std::puts("Failed to request image buffer: TSE not in RUNNING state");
     return;
@@ -253,7 +253,7 @@ int32_t TovraStateEngine::sharpness(const ImageBuffer& image) {
 
 void TovraStateEngine::process(const std::string& frameKey, ImageBuffer& image,
                                ExtraFrameData& extra) {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) {
     std::puts("Skipped input frame: TSE not in RUNNING state");
     dropLent(frameKey, image);
@@ -306,7 +306,7 @@ void TovraStateEngine::process(const std::string& frameKey, ImageBuffer& image,
 }
 
 void TovraStateEngine::processSingleImage(ImageBuffer& image, ExtraFrameData& extra) {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) {
     std::puts("Skipped input frame: TSE not in RUNNING state");
     return;
@@ -331,27 +331,27 @@ void TovraStateEngine::processSingleImage(ImageBuffer& image, ExtraFrameData& ex
 }
 
 EngineState TovraStateEngine::getState() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return state_;
 }
 
 const TovraExecutionEngine* TovraStateEngine::executor() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return executor_.get();
 }
 
 size_t TovraStateEngine::pendingBufferCount() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return pendingBuffers_.size();
 }
 
 bool TovraStateEngine::hasHeldRecord() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return static_cast<bool>(heldRecord_);
 }
 
 double TovraStateEngine::lastTakenTime() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return lastTakenTime_;
 }
 

@@ -4,6 +4,8 @@
 #   scripts/test.sh                       normal build (build/)
 #   scripts/test.sh --sanitize asan       whole suite under AddressSanitizer + UBSan (build-asan/)
 #   scripts/test.sh --sanitize tsan       concurrency tests under ThreadSanitizer (build-tsan/)
+#                                         built with clang, which also proves the locking
+#                                         annotations (-Wthread-safety, as an error)
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -16,7 +18,9 @@ jobs=$(nproc 2>/dev/null || echo 2)
 case "$mode" in
   "")   dir=build;      args=(); labels=() ;;
   asan) dir=build-asan; args=(-DORZAVS_SANITIZE=address,undefined -DCMAKE_BUILD_TYPE=Debug); labels=() ;;
-  tsan) dir=build-tsan; args=(-DORZAVS_SANITIZE=thread -DCMAKE_BUILD_TYPE=RelWithDebInfo); labels=(-L concurrency) ;;
+  tsan) dir=build-tsan; labels=(-L concurrency)
+        args=(-DORZAVS_SANITIZE=thread -DCMAKE_BUILD_TYPE=RelWithDebInfo
+              -DCMAKE_C_COMPILER=clang -DCMAKE_CXX_COMPILER=clang++) ;;
   *) echo "test.sh: unknown sanitizer '$mode' (asan or tsan)" >&2; exit 2 ;;
 esac
 

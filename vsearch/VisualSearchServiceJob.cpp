@@ -72,12 +72,12 @@ void VisualSearchServiceJob::waitUntilSettled() const {
 void VisualSearchServiceJob::cancel() { state_.store(Finished); }
 
 std::string VisualSearchServiceJob::lastQueryId() const {
-  std::lock_guard<std::mutex> lock(lastQueryMutex_);
+  MutexLock lock(lastQueryMutex_);
   return lastQueryId_;
 }
 
 double VisualSearchServiceJob::lastQueryRoundTripTime() const {
-  std::lock_guard<std::mutex> lock(lastQueryMutex_);
+  MutexLock lock(lastQueryMutex_);
   return lastQueryRoundTripTime_;
 }
 
@@ -145,7 +145,7 @@ void VisualSearchServiceJob::run() {
     std::string queryId;
     double roundTrip = -1.0;
     {
-      std::lock_guard<std::mutex> lock(lastQueryMutex_);
+      MutexLock lock(lastQueryMutex_);
       queryId = lastQueryId_;
       roundTrip = lastQueryRoundTripTime_;
     }
@@ -210,7 +210,7 @@ void VisualSearchServiceJob::handleServerResponse(const Server::ServerResponse& 
                  : Server::RESPONSE_PARSE_ERROR;
   }
   {
-    std::lock_guard<std::mutex> lock(lastQueryMutex_);
+    MutexLock lock(lastQueryMutex_);
     lastQueryId_ = metadata.queryID;
     lastQueryRoundTripTime_ = response.roundtripTime;
   }

@@ -1,8 +1,10 @@
 #include "engine/FrameRecordManager.h"
 
-#include <cstdio>
+#include "types/DiagnosticOutput.h"
 
 namespace Tovra {
+
+using OrzaVSMobile::reportLine;
 
 FrameRecordManager::FrameRecordManager(size_t count) {
   slots_.reserve(count);
@@ -30,7 +32,7 @@ bool FrameRecordManager::restart() {
   MutexLock lock(mutex_);
   for (auto& slot : slots_) {
     if (slot && slot.use_count() != 1) {
-      std::puts("Unable to restart frame record manager () as some frame(s) are still outstanding");
+      reportLine("Unable to restart frame record manager () as some frame(s) are still outstanding");
       return false;
     }
     slot = std::make_shared<FrameRecord>();

@@ -1,12 +1,14 @@
 #include "exec/TovraExecutionEngine.h"
 
-#include <cstdio>
+#include "types/DiagnosticOutput.h"
 
 namespace Tovra {
 
+using OrzaVSMobile::reportLine;
+
 TovraExecutionEngine::TovraExecutionEngine(uint32_t threadCount) : threadCount_(threadCount) {
   if (threadCount == 0) {
-    std::puts("Initialized TovraExecutionEngine with invalid number of threads");
+    reportLine("Initialized TovraExecutionEngine with invalid number of threads");
     return;
   }
   workers_.reserve(threadCount);
@@ -39,7 +41,7 @@ void TovraExecutionEngine::addJob(Job* job) {
   job->markQueued();
   UniqueLock guard(lock_);
   if (stopping_ || canceled_) {
-    std::puts("Error: Adding job to stopped/canceled execution engine");
+    reportLine("Error: Adding job to stopped/canceled execution engine");
     job->finishUnlessAwaiting();
     return;
   }
@@ -67,7 +69,7 @@ void TovraExecutionEngine::workerLoop() {
     queue_.pop_front();
     guard.unlock();
     if (job == nullptr) {
-      std::puts("Next Job is NULL");
+      reportLine("Next Job is NULL");
       continue;
     }
     if (!stopping_ && !canceled_) job->run();

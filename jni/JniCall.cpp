@@ -1,4 +1,5 @@
 #include "jni/JniCall.h"
+#include "types/DiagnosticOutput.h"
 
 #include <cstdio>
 #include <new>
@@ -25,8 +26,8 @@ CallFrame::~CallFrame() {
   if (!parked_) return;
   if (env_->ExceptionCheck()) {
     // The function's own exception is what Java sees; say what was dropped for it.
-    std::printf("Dropped Java exception from a callback: %s: %s\n", className_.c_str(),
-                message_.c_str());
+    OrzaVSMobile::reportLinef("Dropped Java exception from a callback: %s: %s",
+                              className_.c_str(), message_.c_str());
     return;
   }
   Swig::DirectorException(className_.c_str(), message_.c_str()).raiseJavaException(env_);
@@ -54,8 +55,8 @@ void parkException(const char* className, const char* message, const char* where
   // No call from Java is in progress on this thread (an engine worker): nobody can receive it,
   // and letting it unwind would end the process or leave the engine mid-operation. It is
   // reported on standard output instead.
-  std::printf("Dropped Java exception from %s (no Java caller on this thread): %s: %s\n", where,
-              className, message);
+  OrzaVSMobile::reportLinef("Dropped Java exception from %s (no Java caller on this thread): %s: %s",
+                            where, className, message);
 }
 
 void parkPendingException(JNIEnv* env, const char* where) noexcept {
@@ -68,7 +69,7 @@ void parkPendingException(JNIEnv* env, const char* where) noexcept {
     parkException(exception.classname(), exception.what(), where);
   } catch (...) {
     env->DeleteLocalRef(throwable);
-    std::printf("Dropped Java exception from %s\n", where);
+    OrzaVSMobile::reportLinef("Dropped Java exception from %s", where);
   }
 }
 

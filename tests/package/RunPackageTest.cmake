@@ -4,6 +4,8 @@
 #                      consumer finds it with find_package(OrzaVSMobile)
 # Inputs: MODE, SOURCE_DIR (library sources), BINARY_DIR (library build tree), WORK_DIR,
 # GENERATOR, C_COMPILER, CXX_COMPILER.
+cmake_policy(VERSION 3.16)
+
 foreach(var MODE SOURCE_DIR BINARY_DIR WORK_DIR GENERATOR CXX_COMPILER)
   if(NOT DEFINED ${var} OR "${${var}}" STREQUAL "")
     message(FATAL_ERROR "RunPackageTest: ${var} is not set")

@@ -8,6 +8,7 @@
 #include "server/ServerRequest.h"
 #include "server/ServerResponse.h"
 #include "types/ByteArray.h"
+#include "types/Diagnostics.h"
 #include "types/EnumNames.h"
 #include "types/EventDelegateBase.h"
 #include "types/FrameData.h"

@@ -2,6 +2,10 @@
 function(orzavs_target_options target)
   if(CMAKE_CXX_COMPILER_ID MATCHES "GNU|Clang")
     target_compile_options(${target} PRIVATE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor)
+    if(CMAKE_CXX_COMPILER_ID MATCHES "Clang")
+      # Proves the locking annotations of types/Mutex.h (fields ORZAVS_GUARDED_BY a mutex).
+      target_compile_options(${target} PRIVATE -Wthread-safety)
+    endif()
     if(ORZAVS_WERROR)
       target_compile_options(${target} PRIVATE -Werror)
     endif()

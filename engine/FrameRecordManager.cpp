@@ -1,8 +1,10 @@
 #include "engine/FrameRecordManager.h"
 
-#include <cstdio>
+#include "types/DiagnosticOutput.h"
 
 namespace Tovra {
+
+using OrzaVSMobile::reportLine;
 
 FrameRecordManager::FrameRecordManager(size_t count) {
   slots_.reserve(count);
@@ -10,7 +12,7 @@ FrameRecordManager::FrameRecordManager(size_t count) {
 }
 
 std::shared_ptr<FrameRecord> FrameRecordManager::getNewSlot() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   for (auto& slot : slots_) {
     if (slot && slot.use_count() == 1) {
       // Take the new reference before touching the record. use_count() is a relaxed read;
@@ -27,10 +29,10 @@ std::shared_ptr<FrameRecord> FrameRecordManager::getNewSlot() {
 }
 
 bool FrameRecordManager::restart() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   for (auto& slot : slots_) {
     if (slot && slot.use_count() != 1) {
-      std::puts("Unable to restart frame record manager () as some frame(s) are still outstanding");
+      reportLine("Unable to restart frame record manager () as some frame(s) are still outstanding");
       return false;
     }
     slot = std::make_shared<FrameRecord>();

@@ -4,10 +4,10 @@
 #include <cstddef>
 #include <cstdint>
 #include <memory>
-#include <mutex>
 #include <vector>
 
 #include "engine/FrameRecord.h"
+#include "types/Mutex.h"
 
 namespace Tovra {
 
@@ -27,12 +27,14 @@ class FrameRecordManager {
   // renewed, numbering restarts at 0.
   bool restart();
 
-  size_t size() const { return slots_.size(); }
+  // The number of slots never changes after construction.
+  size_t size() const ORZAVS_NO_THREAD_SAFETY_ANALYSIS { return slots_.size(); }
 
  private:
-  std::mutex mutex_;
-  uint64_t nextFrameId_ = 0;
-  std::vector<std::shared_ptr<FrameRecord>> slots_;
+  Mutex mutex_;
+  uint64_t nextFrameId_ ORZAVS_GUARDED_BY(mutex_) = 0;
+  // The vector's length is fixed at construction; the slots themselves change under the lock.
+  std::vector<std::shared_ptr<FrameRecord>> slots_ ORZAVS_GUARDED_BY(mutex_);
 };
 
 }  // namespace Tovra

@@ -1,16 +1,19 @@
 #include "engine/TovraStateEngine.h"
 
 #include <cmath>
-#include <cstdio>
 #include <ctime>
 #include <locale>
 #include <sstream>
 #include <utility>
 
 #include "features/InterestPoints.h"
+#include "types/DiagnosticOutput.h"
 #include "types/ImageFormat.h"
 
 namespace Tovra {
+
+using OrzaVSMobile::reportLine;
+using OrzaVSMobile::reportLinef;
 
 using OrzaVSMobile::ExtraFrameData;
 using OrzaVSMobile::ImageBuffer;
@@ -95,7 +98,7 @@ void TovraStateEngine::reset() {
 }
 
 void TovraStateEngine::startEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if ((state_ | 2) != 2) return;  // only from STOPPED or PAUSED
   reset();
   auto fresh = std::make_unique<TovraExecutionEngine>(1);
@@ -106,7 +109,7 @@ void TovraStateEngine::startEngine() {
 }
 
 void TovraStateEngine::stopEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ == STOPPED) return;
   reset();
   std::unique_ptr<TovraExecutionEngine> old = std::move(executor_);
@@ -115,14 +118,14 @@ void TovraStateEngine::stopEngine() {
 }
 
 void TovraStateEngine::pauseEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) return;
   reset();
   state_ = PAUSED;
 }
 
 void TovraStateEngine::resumeEngine() {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != PAUSED) return;
   if (executor_) executor_->resumeJobs();
   state_ = RUNNING;
@@ -165,11 +168,11 @@ bool TovraStateEngine::acceptsGeometry(const ImageBuffer& image, bool packedAllo
   // are dropped here with one line. (A frame whose memory is shorter than its geometry cannot
   // be detected when the memory is the caller's own; when its size is known it is checked.)
   if (image.data == nullptr) {
-    std::puts("Skipped input frame: image has no pixel data");
+    reportLine("Skipped input frame: image has no pixel data");
     return false;
   }
   if (image.width <= 0 || image.height <= 0) {
-    std::printf("Skipped input frame: invalid image size %dx%d\n", image.width, image.height);
+    reportLinef("Skipped input frame: invalid image size %dx%d", image.width, image.height);
     return false;
   }
   int64_t rowBytes = image.width;
@@ -178,14 +181,14 @@ bool TovraStateEngine::acceptsGeometry(const ImageBuffer& image, bool packedAllo
     rowBytes *= image.numChannels;
   }
   if (image.widthStep < rowBytes) {
-    std::printf("Skipped input frame: row stride %d is smaller than a row of %lld bytes\n",
+    reportLinef("Skipped input frame: row stride %d is smaller than a row of %lld bytes",
                 image.widthStep, static_cast<long long>(rowBytes));
     return false;
   }
   const int64_t known = image.knownLength();
   const int64_t plane = static_cast<int64_t>(image.height - 1) * image.widthStep + rowBytes;
   if (known >= 0 && known < plane) {
-    std::printf("Skipped input frame: image buffer holds %lld bytes, a %dx%d image needs %lld\n",
+    reportLinef("Skipped input frame: image buffer holds %lld bytes, a %dx%d image needs %lld",
                 static_cast<long long>(known), image.width, image.height,
                 static_cast<long long>(plane));
     return false;
@@ -194,19 +197,19 @@ bool TovraStateEngine::acceptsGeometry(const ImageBuffer& image, bool packedAllo
 }
 
 void TovraStateEngine::requestImageBuffer(ImageBuffer& buffer, std::string& frameKey) {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) {
-    std::puts("Failed to request image buffer: TSE not in RUNNING state");
+    reportLine("Failed to request image buffer: TSE not in RUNNING state");
     return;
   }
   std::shared_ptr<FrameRecord> record = frameRecords_.getNewSlot();
   if (!record) {
-    std::puts("Failed to get a new frame record slot in getRequestImageBuffers");
+    reportLine("Failed to get a new frame record slot in getRequestImageBuffers");
     return;
   }
   if (!record->lendBuffer(buffer)) {
     // Negative height or stride, or a size beyond 2 GiB: nothing can be lent for it.
-    std::printf("Failed to request image buffer: invalid geometry (height %d, widthStep %d)\n",
+    reportLinef("Failed to request image buffer: invalid geometry (height %d, widthStep %d)",
                 buffer.height, buffer.widthStep);
     return;
   }
@@ -253,14 +256,14 @@ int32_t TovraStateEngine::sharpness(const ImageBuffer& image) {
 
 void TovraStateEngine::process(const std::string& frameKey, ImageBuffer& image,
                                ExtraFrameData& extra) {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) {
-    std::puts("Skipped input frame: TSE not in RUNNING state");
+    reportLine("Skipped input frame: TSE not in RUNNING state");
     dropLent(frameKey, image);
     return;
   }
   if (!isContinuousFormat(image.format)) {
-    std::puts("Failed to process non-GRAY/YUV format in continuous scanning mode");
+    reportLine("Failed to process non-GRAY/YUV format in continuous scanning mode");
     dropLent(frameKey, image);
     return;
   }
@@ -306,19 +309,19 @@ void TovraStateEngine::process(const std::string& frameKey, ImageBuffer& image,
 }
 
 void TovraStateEngine::processSingleImage(ImageBuffer& image, ExtraFrameData& extra) {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   if (state_ != RUNNING) {
-    std::puts("Skipped input frame: TSE not in RUNNING state");
+    reportLine("Skipped input frame: TSE not in RUNNING state");
     return;
   }
   if (!acceptsGeometry(image, true)) return;
   std::shared_ptr<FrameRecord> record = frameRecords_.getNewSlot();
   if (!record) {
-    std::puts("Failed to get a new frame record slot");
+    reportLine("Failed to get a new frame record slot");
     return;
   }
   if (!record->setSourceImage(image, extra)) {
-    std::puts("Failed to set source image");
+    reportLine("Failed to set source image");
     return;
   }
   VisualSearchServiceJob* job = idleJob();
@@ -331,27 +334,27 @@ void TovraStateEngine::processSingleImage(ImageBuffer& image, ExtraFrameData& ex
 }
 
 EngineState TovraStateEngine::getState() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return state_;
 }
 
 const TovraExecutionEngine* TovraStateEngine::executor() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return executor_.get();
 }
 
 size_t TovraStateEngine::pendingBufferCount() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return pendingBuffers_.size();
 }
 
 bool TovraStateEngine::hasHeldRecord() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return static_cast<bool>(heldRecord_);
 }
 
 double TovraStateEngine::lastTakenTime() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return lastTakenTime_;
 }
 

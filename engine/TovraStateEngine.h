@@ -6,7 +6,6 @@
 #include <deque>
 #include <map>
 #include <memory>
-#include <mutex>
 #include <string>
 #include <vector>
 
@@ -19,6 +18,7 @@
 #include "types/FrameData.h"
 #include "types/Identifiers.h"
 #include "types/ImageBuffer.h"
+#include "types/Mutex.h"
 #include "types/Point.h"
 #include "vsearch/VisualSearchServiceJob.h"
 
@@ -83,37 +83,38 @@ class TovraStateEngine {
   double lastTakenTime() const;
 
  private:
-  // Shared by start, stop, pause and the destructor; the caller holds the mutex (or is the
-  // destructor).
-  void reset();
+  // Shared by start, stop, pause and the destructor (which needs no lock: nobody else is inside).
+  void reset() ORZAVS_REQUIRES(mutex_);
   // First job that is not busy, or null.
   VisualSearchServiceJob* idleJob() const;
   // Removes `frameKey` from the lent frames and returns its record (null if unknown).
-  std::shared_ptr<FrameRecord> takeLent(const std::string& frameKey);
+  std::shared_ptr<FrameRecord> takeLent(const std::string& frameKey) ORZAVS_REQUIRES(mutex_);
   // Removes `frameKey` from the lent frames and detaches `image` from its memory.
-  void dropLent(const std::string& frameKey, OrzaVSMobile::ImageBuffer& image);
+  void dropLent(const std::string& frameKey, OrzaVSMobile::ImageBuffer& image)
+      ORZAVS_REQUIRES(mutex_);
   // Whether `image` describes a frame whose first plane (and, for memory whose size is known,
   // everything the record copies) can be read; prints a line and returns false otherwise.
   bool acceptsGeometry(const OrzaVSMobile::ImageBuffer& image, bool packedAllowed) const;
 
-  mutable std::mutex mutex_;
-  EngineState state_ = STOPPED;
+  mutable Mutex mutex_;
+  EngineState state_ ORZAVS_GUARDED_BY(mutex_) = STOPPED;
+  // Set before the engine starts (not locked); the job list is fixed at construction.
   EventDelegateBase* eventDelegate_ = nullptr;        // not owned
   Server::ServerDelegate* serverDelegate_ = nullptr;  // not owned
   std::vector<std::unique_ptr<VisualSearchServiceJob>> jobs_;
-  std::unique_ptr<TovraExecutionEngine> executor_;
-  FrameRecordManager frameRecords_;
-  std::map<std::string, std::shared_ptr<FrameRecord>> pendingBuffers_;
-  double lastTakenTime_ = -1.0;
-  std::shared_ptr<FrameRecord> heldRecord_;
+  std::unique_ptr<TovraExecutionEngine> executor_ ORZAVS_GUARDED_BY(mutex_);
+  FrameRecordManager frameRecords_;  // has its own lock, taken after mutex_
+  std::map<std::string, std::shared_ptr<FrameRecord>> pendingBuffers_ ORZAVS_GUARDED_BY(mutex_);
+  double lastTakenTime_ ORZAVS_GUARDED_BY(mutex_) = -1.0;
+  std::shared_ptr<FrameRecord> heldRecord_ ORZAVS_GUARDED_BY(mutex_);
 
   // Reused for every frame so that steady-state frames allocate nothing here.
-  std::vector<OrzaVSMobile::Point2f> points_;
+  std::vector<OrzaVSMobile::Point2f> points_ ORZAVS_GUARDED_BY(mutex_);
   // Pixel storage of frames that were lent to the client but dropped by a reset before the
   // client handed them back. The client may still be writing into that memory (a camera thread
   // between requestImageBuffer and process while another thread pauses), so the bytes are kept
   // alive here for a while instead of being freed with the renewed records.
-  std::deque<std::vector<uint8_t>> retiredLentPixels_;
+  std::deque<std::vector<uint8_t>> retiredLentPixels_ ORZAVS_GUARDED_BY(mutex_);
 };
 
 }  // namespace Tovra

@@ -1,12 +1,14 @@
 #include "exec/TovraExecutionEngine.h"
 
-#include <cstdio>
+#include "types/DiagnosticOutput.h"
 
 namespace Tovra {
 
+using OrzaVSMobile::reportLine;
+
 TovraExecutionEngine::TovraExecutionEngine(uint32_t threadCount) : threadCount_(threadCount) {
   if (threadCount == 0) {
-    std::puts("Initialized TovraExecutionEngine with invalid number of threads");
+    reportLine("Initialized TovraExecutionEngine with invalid number of threads");
     return;
   }
   workers_.reserve(threadCount);
@@ -15,7 +17,7 @@ TovraExecutionEngine::TovraExecutionEngine(uint32_t threadCount) : threadCount_(
   } catch (...) {
     // Threads already started must be stopped and joined before the members go away.
     {
-      std::lock_guard<std::mutex> guard(lock_);
+      MutexLock guard(lock_);
       stopping_ = true;
     }
     wakeup_.notify_all();
@@ -26,7 +28,7 @@ TovraExecutionEngine::TovraExecutionEngine(uint32_t threadCount) : threadCount_(
 
 TovraExecutionEngine::~TovraExecutionEngine() {
   {
-    std::lock_guard<std::mutex> guard(lock_);
+    MutexLock guard(lock_);
     stopping_ = true;
   }
   wakeup_.notify_all();
@@ -37,9 +39,9 @@ TovraExecutionEngine::~TovraExecutionEngine() {
 void TovraExecutionEngine::addJob(Job* job) {
   if (stopping_ || job == nullptr || canceled_) return;
   job->markQueued();
-  std::unique_lock<std::mutex> guard(lock_);
+  UniqueLock guard(lock_);
   if (stopping_ || canceled_) {
-    std::puts("Error: Adding job to stopped/canceled execution engine");
+    reportLine("Error: Adding job to stopped/canceled execution engine");
     job->finishUnlessAwaiting();
     return;
   }
@@ -49,25 +51,25 @@ void TovraExecutionEngine::addJob(Job* job) {
 }
 
 void TovraExecutionEngine::cancelJobs() {
-  std::lock_guard<std::mutex> guard(lock_);
+  MutexLock guard(lock_);
   canceled_ = true;
 }
 
 void TovraExecutionEngine::resumeJobs() {
-  std::lock_guard<std::mutex> guard(lock_);
+  MutexLock guard(lock_);
   canceled_ = false;
 }
 
 void TovraExecutionEngine::workerLoop() {
   for (;;) {
-    std::unique_lock<std::mutex> guard(lock_);
-    wakeup_.wait(guard, [this] { return stopping_ || !queue_.empty(); });
+    UniqueLock guard(lock_);
+    while (!stopping_ && queue_.empty()) wakeup_.wait(guard.native());
     if (queue_.empty()) return;  // stopping and drained
     Job* job = queue_.front();
     queue_.pop_front();
     guard.unlock();
     if (job == nullptr) {
-      std::puts("Next Job is NULL");
+      reportLine("Next Job is NULL");
       continue;
     }
     if (!stopping_ && !canceled_) job->run();

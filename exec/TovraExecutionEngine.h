@@ -5,11 +5,11 @@
 #include <condition_variable>
 #include <cstdint>
 #include <deque>
-#include <mutex>
 #include <thread>
 #include <vector>
 
 #include "exec/Job.h"
+#include "types/Mutex.h"
 
 namespace Tovra {
 
@@ -42,8 +42,8 @@ class TovraExecutionEngine {
   uint32_t threadCount_;
   std::vector<std::thread> workers_;
   std::condition_variable wakeup_;
-  std::mutex lock_;
-  std::deque<Job*> queue_;
+  Mutex lock_;
+  std::deque<Job*> queue_ ORZAVS_GUARDED_BY(lock_);
 };
 
 }  // namespace Tovra

@@ -95,12 +95,13 @@ inline V maxArcMin(const V m[16]) {
   return best;
 }
 
-// Runs `block(x, laneMask)` over the centres 3 <= x < width-3 in blocks of 16. The last block
-// is moved back to end at width-3; its lanes that were already covered are masked off.
+// Runs `block(x, laneMask)` over the centres first <= x < xEnd in blocks of 16 (xEnd - 16 >= 3,
+// so a block never starts left of the first centre of the row). The last block is moved back to
+// end at xEnd; its lanes that were already covered are masked off (their score bytes come out
+// the same when the block stores them again).
 template <class Block>
-inline void forEachBlock(int width, Block&& block) {
-  const int xEnd = width - 3;
-  for (int x = 3; x < xEnd; x += 16) {
+inline void forEachBlock(int first, int xEnd, Block&& block) {
+  for (int x = first; x < xEnd; x += 16) {
     unsigned from = 0;
     if (x + 16 > xEnd) {
       from = static_cast<unsigned>(x - (xEnd - 16));
@@ -210,28 +211,22 @@ int detectRow(const uint8_t* row, ptrdiff_t s, int width, int b, uint8_t* score,
       VecOps::store(score + x + 16, zero);
     }
   }
-  // Then single blocks; the last one is moved back to end at xEnd, and its lanes that were
-  // already covered are left out of the corner list (their score bytes come out the same).
-  for (; x < xEnd; x += 16) {
-    unsigned from = 0;
-    if (x + 16 > xEnd) {
-      from = static_cast<unsigned>(x - (xEnd - 16));
-      x = xEnd - 16;
-    }
-    const V c = VecOps::load(r.r0 + x), a = VecOps::load(r.rp3 + x), bl = VecOps::load(r.rm3 + x);
+  // Then single blocks.
+  forEachBlock(x, xEnd, [&](int bx, unsigned laneMask) {
+    const V c = VecOps::load(r.r0 + bx), a = VecOps::load(r.rp3 + bx), bl = VecOps::load(r.rm3 + bx);
     if (!VecOps::anyNonZero(farFromCentre(VecOps::adds(c, thr), VecOps::subs(c, thr), a, bl))) {
-      VecOps::store(score + x, zero);
-      continue;
+      VecOps::store(score + bx, zero);
+      return;
     }
-    emit(x, finishBlock(r, x, thr, c, a, bl, score), (0xFFFFu << from) & 0xFFFFu);
-  }
+    emit(bx, finishBlock(r, bx, thr, c, a, bl, score), laneMask);
+  });
   return n;
 }
 
 int suppressRow(const uint8_t* above, const uint8_t* mid, const uint8_t* below, int width, int32_t* keptXs) {
   if (width - 6 < 16) return scalarKernels().suppress(above, mid, below, width, keptXs);
   int n = 0;
-  forEachBlock(width, [&](int x, unsigned laneMask) {
+  forEachBlock(3, width - 3, [&](int x, unsigned laneMask) {
     const V v = VecOps::load(mid + x);
     if (!VecOps::anyNonZero(v)) return;
     V around = VecOps::vmax(VecOps::load(mid + x - 1), VecOps::load(mid + x + 1));

@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "jni/JniCall.h"
+#include "types/DiagnosticOutput.h"
 
 using orzavs::jni::toHandle;
 
@@ -130,8 +131,8 @@ jobject upcallTarget(JNIEnv* env, const Swig::Director& director, int upcallInde
 }
 
 void reportDetached(const char* scope, const char* operation) {
-  std::printf("Skipped callback %s%s: the thread cannot be attached to the Java VM\n", scope,
-              operation);
+  OrzaVSMobile::reportLinef("Skipped callback %s%s: the thread cannot be attached to the Java VM",
+                            scope, operation);
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 
 #include <string>
 
+#include "jni/DiagnosticsListener.h"
 #include "jni/Directors.h"
 #include "jni/TypeNames.h"
 
@@ -54,7 +55,10 @@ void changeOwnership(JNIEnv* env, jobject jself, jlong handle, jboolean takeOrRe
 
 // ---- module ---------------------------------------------------------------------------------------
 
-ORZAVS_JNI_EXPORT(void, swig_1module_1init)(JNIEnv* env, jclass cls) { Swig::initModule(env, cls); }
+ORZAVS_JNI_EXPORT(void, swig_1module_1init)(JNIEnv* env, jclass cls) {
+  Swig::initModule(env, cls);
+  orzavs::jni::registerDiagnosticsNatives(env);
+}
 
 // ---- EventDelegateBase ----------------------------------------------------------------------------
 

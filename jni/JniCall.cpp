@@ -1,4 +1,5 @@
 #include "jni/JniCall.h"
+#include "types/DiagnosticOutput.h"
 
 #include <atomic>
 #include <cstdio>
@@ -27,9 +28,9 @@ namespace {
 void printException(JNIEnv* env, const char* prefix, jthrowable throwable) noexcept {
   try {
     Swig::DirectorException described(env, throwable);
-    std::printf("%s: %s: %s\n", prefix, described.classname(), described.what());
+    OrzaVSMobile::reportLinef("%s: %s: %s", prefix, described.classname(), described.what());
   } catch (...) {
-    std::printf("%s\n", prefix);
+    OrzaVSMobile::reportLine(prefix);
   }
 }
 

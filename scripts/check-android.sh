@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Checks the project's Android configuration without the NDK: configures and builds it with
 # cmake/toolchains/android-emulated.cmake (CMAKE_SYSTEM_NAME Android, ANDROID set, armeabi-v7a
-# flags, clang for 32-bit ARM, a sysroot that has jni.h and no libjpeg) passing libjpeg and
+# flags, clang for 32-bit ARM, a sysroot that has jni.h and liblog and no libjpeg) passing libjpeg and
 # nlohmann-json the way README.md's "Android" section tells an app developer to, then checks
 # that no test or benchmark was configured and that the JNI library exports only JNI symbols.
 #   scripts/check-android.sh          build-android/
@@ -27,6 +27,27 @@ for h in jpeglib.h jconfig.h jmorecfg.h jerror.h; do
   ln -sf "$(readlink -f "$deps/usr/include/$h")" "$jpeg/include/$h"
 done
 ln -sf "$deps/usr/lib/arm-linux-gnueabihf/libjpeg.so" "$jpeg/lib/libjpeg.so"
+# The NDK's log interface (android/log.h, liblog.so): a declaration-compatible stand-in, enough to
+# compile and link the default diagnostic sink; nothing here runs it.
+mkdir -p "$ndk_sysroot/usr/include/android" "$ndk_sysroot/usr/lib"
+cat >"$ndk_sysroot/usr/include/android/log.h" <<'EOF'
+#pragma once
+typedef enum android_LogPriority {
+  ANDROID_LOG_UNKNOWN = 0, ANDROID_LOG_DEFAULT, ANDROID_LOG_VERBOSE, ANDROID_LOG_DEBUG,
+  ANDROID_LOG_INFO, ANDROID_LOG_WARN, ANDROID_LOG_ERROR, ANDROID_LOG_FATAL, ANDROID_LOG_SILENT
+} android_LogPriority;
+#ifdef __cplusplus
+extern "C" {
+#endif
+int __android_log_write(int prio, const char* tag, const char* text);
+#ifdef __cplusplus
+}
+#endif
+EOF
+echo 'int __android_log_write(int p, const char* t, const char* s) { return p + (t != s); }' \
+  >"$dir/log-stub.c"
+clang --target=arm-linux-gnueabihf -shared -nostdlib -fPIC -o "$ndk_sysroot/usr/lib/liblog.so" \
+  "$dir/log-stub.c"
 ln -sfn "$deps/usr/include/nlohmann" "$json/include/nlohmann"
 
 jobs=$(nproc 2>/dev/null || echo 2)

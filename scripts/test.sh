@@ -4,6 +4,8 @@
 #   scripts/test.sh                       normal build (build/)
 #   scripts/test.sh --sanitize asan       whole suite under AddressSanitizer + UBSan (build-asan/)
 #   scripts/test.sh --sanitize tsan       concurrency tests under ThreadSanitizer (build-tsan/)
+#                                         built with clang, which also proves the locking
+#                                         annotations (-Wthread-safety, as an error)
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -16,12 +18,21 @@ jobs=$(nproc 2>/dev/null || echo 2)
 case "$mode" in
   "")   dir=build;      args=(); labels=() ;;
   asan) dir=build-asan; args=(-DORZAVS_SANITIZE=address,undefined -DCMAKE_BUILD_TYPE=Debug); labels=() ;;
-  tsan) dir=build-tsan; args=(-DORZAVS_SANITIZE=thread -DCMAKE_BUILD_TYPE=RelWithDebInfo); labels=(-L concurrency) ;;
+  tsan) dir=build-tsan; labels=(-L concurrency)
+        args=(-DORZAVS_SANITIZE=thread -DCMAKE_BUILD_TYPE=RelWithDebInfo
+              -DCMAKE_C_COMPILER=clang -DCMAKE_CXX_COMPILER=clang++) ;;
   *) echo "test.sh: unknown sanitizer '$mode' (asan or tsan)" >&2; exit 2 ;;
 esac
 
 cmake -S . -B "$dir" -G Ninja -DORZAVS_WERROR=ON "${args[@]}" >/dev/null
-cmake --build "$dir" -j "$jobs"
+if [ "$mode" = tsan ]; then
+  # Only what runs under ThreadSanitizer (the binaries of the concurrency tests, named as their
+  # tests) and the JNI library: all the library's code, compiled by clang with -Wthread-safety.
+  mapfile -t targets < <(ctest --test-dir "$dir" -N "${labels[@]}" | sed -n 's/^ *Test *#[0-9]*: //p')
+  cmake --build "$dir" -j "$jobs" --target "${targets[@]}" OrzaVSMobile
+else
+  cmake --build "$dir" -j "$jobs"
+fi
 export ASAN_OPTIONS="detect_leaks=1:abort_on_error=0:${ASAN_OPTIONS:-}"
 export UBSAN_OPTIONS="print_stacktrace=1:halt_on_error=1:${UBSAN_OPTIONS:-}"
 export TSAN_OPTIONS="halt_on_error=1:second_deadlock_stack=1:${TSAN_OPTIONS:-}"

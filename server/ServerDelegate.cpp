@@ -5,7 +5,7 @@ namespace Server {
 
 bool ServerDelegate::sendServerRequest(const ServerRequest& request) {
   {
-    std::lock_guard<std::mutex> lock(mutex_);
+    MutexLock lock(mutex_);
     // Registered before the transfer starts, so an answer that arrives while
     // sendServerRequestImpl is still running is routed correctly. An existing entry keeps its
     // first handler; a failed transfer leaves the registration in place.
@@ -18,7 +18,7 @@ void ServerDelegate::pushServerResponse(const ServerResponse& response) {
   ServerResponseHandler* handler = nullptr;
   std::multimap<const ServerResponseHandler*, std::thread::id>::iterator mark;
   {
-    std::lock_guard<std::mutex> lock(mutex_);
+    MutexLock lock(mutex_);
     auto it = pending_.find(response.id);
     if (it == pending_.end()) return;
     handler = it->second;
@@ -31,7 +31,7 @@ void ServerDelegate::pushServerResponse(const ServerResponse& response) {
     ServerDelegate* self;
     std::multimap<const ServerResponseHandler*, std::thread::id>::iterator mark;
     ~Unmark() {
-      std::lock_guard<std::mutex> lock(self->mutex_);
+      MutexLock lock(self->mutex_);
       self->delivering_.erase(mark);
       self->delivered_.notify_all();
     }
@@ -40,7 +40,7 @@ void ServerDelegate::pushServerResponse(const ServerResponse& response) {
 }
 
 void ServerDelegate::forgetHandler(const ServerResponseHandler* handler) {
-  std::unique_lock<std::mutex> lock(mutex_);
+  UniqueLock lock(mutex_);
   for (auto it = pending_.begin(); it != pending_.end();) {
     if (it->second == handler) {
       it = pending_.erase(it);
@@ -50,18 +50,20 @@ void ServerDelegate::forgetHandler(const ServerResponseHandler* handler) {
   }
   // Wait for deliveries on other threads only: a handler being forgotten from inside its own
   // callback would otherwise wait for itself.
+  while (deliveringElsewhere(handler)) delivered_.wait(lock.native());
+}
+
+bool ServerDelegate::deliveringElsewhere(const ServerResponseHandler* handler) const {
   const std::thread::id self = std::this_thread::get_id();
-  delivered_.wait(lock, [&] {
-    auto range = delivering_.equal_range(handler);
-    for (auto it = range.first; it != range.second; ++it) {
-      if (it->second != self) return false;
-    }
-    return true;
-  });
+  auto range = delivering_.equal_range(handler);
+  for (auto it = range.first; it != range.second; ++it) {
+    if (it->second != self) return true;
+  }
+  return false;
 }
 
 size_t ServerDelegate::pendingCount() const {
-  std::lock_guard<std::mutex> lock(mutex_);
+  MutexLock lock(mutex_);
   return pending_.size();
 }
 

@@ -3,12 +3,12 @@
 
 #include <condition_variable>
 #include <map>
-#include <mutex>
 #include <string>
 #include <thread>
 
 #include "server/ServerRequest.h"
 #include "server/ServerResponse.h"
+#include "types/Mutex.h"
 
 namespace Tovra {
 namespace Server {
@@ -47,10 +47,12 @@ class ServerDelegate : public ServerDelegateInterface {
   size_t pendingCount() const;
 
  private:
-  mutable std::mutex mutex_;
-  std::map<std::string, ServerResponseHandler*> pending_;
+  mutable Mutex mutex_;
+  std::map<std::string, ServerResponseHandler*> pending_ ORZAVS_GUARDED_BY(mutex_);
   // Deliveries in progress (handler -> delivering threads), so forgetHandler can wait them out.
-  std::multimap<const ServerResponseHandler*, std::thread::id> delivering_;
+  std::multimap<const ServerResponseHandler*, std::thread::id> delivering_ ORZAVS_GUARDED_BY(mutex_);
+  // Whether a thread other than the caller is delivering to `handler`.
+  bool deliveringElsewhere(const ServerResponseHandler* handler) const ORZAVS_REQUIRES(mutex_);
   std::condition_variable delivered_;
 };
 

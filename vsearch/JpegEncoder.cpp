@@ -7,6 +7,7 @@
 #include <cstring>
 #include <exception>
 #include <limits>
+#include <string>
 
 #include <jerror.h>
 #include <jpeglib.h>
@@ -15,10 +16,11 @@
 
 // How the library is driven
 // -------------------------
-// libjpeg reports fatal errors through a hook that must not return; ours longjmps back to the
-// function that set the jump point. longjmp skips C++ destructors, so every function between the
-// jump point and the hook (the compress routines below, libjpeg's own C frames and the
-// destination callbacks) holds only trivially destructible objects. The caller's vectors are
+// Every library call runs inside one error frame, compressIn. libjpeg reports fatal errors
+// through a hook that must not return; ours keeps the library's message and longjmps back to the
+// jump point that compressIn set. longjmp skips C++ destructors, so every function between the
+// jump point and the hook (compressIn, the compress routines it runs, libjpeg's own C frames and
+// the destination callbacks) holds only trivially destructible objects. The caller's vectors are
 // reached through plain pointers.
 //
 // The output vector grows inside the destination callbacks, which run inside libjpeg's C frames.
@@ -44,6 +46,7 @@ constexpr JSAMPLE kMidGrey = 0x80;
 struct ErrorManager {
   jpeg_error_mgr pub;  // first member: the library hands the hook a jpeg_error_mgr*
   std::jmp_buf jump;
+  char reason[JMSG_LENGTH_MAX];  // the library's message for the fatal error
 };
 
 struct Destination {
@@ -54,8 +57,11 @@ struct Destination {
 };
 
 [[noreturn]] void jumpBackOnFatalError(j_common_ptr cinfo) {
-  // Nothing is printed; the compress routine that set the jump point destroys the compressor.
-  std::longjmp(reinterpret_cast<ErrorManager*>(cinfo->err)->jump, 1);
+  // Nothing is printed: the message is kept for the caller, and the error frame (compressIn)
+  // destroys the compressor.
+  ErrorManager* err = reinterpret_cast<ErrorManager*>(cinfo->err);
+  (*err->pub.format_message)(cinfo, err->reason);
+  std::longjmp(err->jump, 1);
 }
 
 // Appends the first `count` bytes of the work buffer to the output. Returns false, with the
@@ -94,6 +100,7 @@ struct Session {
   std::vector<uint8_t>* output;
   std::exception_ptr* growthFailure;
   int quality;  // already clamped to [0, 100]
+  char* reason;  // JMSG_LENGTH_MAX bytes: the library's message when it fails
 };
 
 void attachDestination(j_compress_ptr cinfo, Destination* dest, const Session& session) {
@@ -112,6 +119,33 @@ int clampQuality(int32_t quality) {
   if (quality <= 0) return 0;
   if (quality >= 100) return 100;
   return quality;
+}
+
+// The one error frame of the encoders. Creates the compressor with its error manager and
+// destination, runs `compress` (which sets the parameters and writes the whole image) and
+// destroys the compressor, on success and on a fatal library error alike. The jump point is set
+// here, in a frame that stays live while `compress` and the library run; everything between it
+// and the error hook is trivially destructible (see the top of this file).
+template <class Frame>
+bool compressIn(const Frame& frame, const Session& session,
+                void (*compress)(j_compress_ptr, const Frame&, const Session&)) {
+  jpeg_compress_struct cinfo;
+  std::memset(&cinfo, 0, sizeof cinfo);  // a failed create then leaves nothing to free
+  ErrorManager err;
+  Destination dest;
+  cinfo.err = jpeg_std_error(&err.pub);
+  err.pub.error_exit = jumpBackOnFatalError;
+  if (setjmp(err.jump)) {
+    jpeg_destroy_compress(&cinfo);
+    std::memcpy(session.reason, err.reason, sizeof err.reason);
+    return false;
+  }
+  jpeg_create_compress(&cinfo);  // checks the library's own version and record size
+  attachDestination(&cinfo, &dest, session);
+  compress(&cinfo, frame, session);
+  jpeg_finish_compress(&cinfo);
+  jpeg_destroy_compress(&cinfo);
+  return true;
 }
 
 // Largest byte count a frame may span so that every offset into it is a valid ptrdiff_t.
@@ -176,39 +210,27 @@ JSAMPLE* allocateImageBytes(j_compress_ptr cinfo, size_t size) {
       (*cinfo->mem->alloc_small)(reinterpret_cast<j_common_ptr>(cinfo), JPOOL_IMAGE, size));
 }
 
-bool compressYuv(const YuvFrame& frame, const Session& session) {
-  jpeg_compress_struct cinfo;
-  std::memset(&cinfo, 0, sizeof cinfo);  // a failed create then leaves nothing to free
-  ErrorManager err;
-  Destination dest;
-  cinfo.err = jpeg_std_error(&err.pub);
-  err.pub.error_exit = jumpBackOnFatalError;
-  if (setjmp(err.jump)) {
-    jpeg_destroy_compress(&cinfo);
-    return false;
-  }
-  jpeg_create_compress(&cinfo);  // checks the library's own version and record size
-  attachDestination(&cinfo, &dest, session);
+void compressYuv(j_compress_ptr cinfo, const YuvFrame& frame, const Session& session) {
 
-  cinfo.image_width = static_cast<JDIMENSION>(frame.width);
-  cinfo.image_height = static_cast<JDIMENSION>(frame.height);
-  cinfo.input_components = 3;
-  cinfo.in_color_space = JCS_YCbCr;
-  jpeg_set_defaults(&cinfo);
-  jpeg_set_quality(&cinfo, session.quality, TRUE);
-  jpeg_set_colorspace(&cinfo, JCS_YCbCr);
-  cinfo.raw_data_in = TRUE;
+  cinfo->image_width = static_cast<JDIMENSION>(frame.width);
+  cinfo->image_height = static_cast<JDIMENSION>(frame.height);
+  cinfo->input_components = 3;
+  cinfo->in_color_space = JCS_YCbCr;
+  jpeg_set_defaults(cinfo);
+  jpeg_set_quality(cinfo, session.quality, TRUE);
+  jpeg_set_colorspace(cinfo, JCS_YCbCr);
+  cinfo->raw_data_in = TRUE;
 #if JPEG_LIB_VERSION >= 70
-  cinfo.do_fancy_downsampling = FALSE;
+  cinfo->do_fancy_downsampling = FALSE;
 #endif
-  cinfo.dct_method = JDCT_IFAST;
-  cinfo.comp_info[0].h_samp_factor = 2;
-  cinfo.comp_info[0].v_samp_factor = 2;
-  cinfo.comp_info[1].h_samp_factor = 1;
-  cinfo.comp_info[1].v_samp_factor = 1;
-  cinfo.comp_info[2].h_samp_factor = 1;
-  cinfo.comp_info[2].v_samp_factor = 1;
-  jpeg_start_compress(&cinfo, TRUE);  // rejects sizes the library cannot handle
+  cinfo->dct_method = JDCT_IFAST;
+  cinfo->comp_info[0].h_samp_factor = 2;
+  cinfo->comp_info[0].v_samp_factor = 2;
+  cinfo->comp_info[1].h_samp_factor = 1;
+  cinfo->comp_info[1].v_samp_factor = 1;
+  cinfo->comp_info[2].h_samp_factor = 1;
+  cinfo->comp_info[2].v_samp_factor = 1;
+  jpeg_start_compress(cinfo, TRUE);  // rejects sizes the library cannot handle
 
   // From here the width and height are at most JPEG_MAX_DIMENSION.
   const size_t width = static_cast<size_t>(frame.width);
@@ -241,7 +263,7 @@ bool compressYuv(const YuvFrame& frame, const Session& session) {
   // the first band the areas hold mid-grey, so the stream never depends on stale memory.
   if (semiPlanar) {
     const size_t areaSize = 8 * chromaRowLen + chromaExtent;
-    JSAMPLE* areas = allocateImageBytes(&cinfo, 2 * areaSize);
+    JSAMPLE* areas = allocateImageBytes(cinfo, 2 * areaSize);
     std::memset(areas, kMidGrey, 2 * areaSize);
     for (size_t k = 0; k < 8; ++k) {
       cbRows[k] = areas + k * chromaRowLen;
@@ -256,14 +278,14 @@ bool compressYuv(const YuvFrame& frame, const Session& session) {
   JSAMPLE* cbScratch = nullptr;
   JSAMPLE* crScratch = nullptr;
 
-  while (cinfo.next_scanline < cinfo.image_height) {
-    const size_t next = cinfo.next_scanline;
+  while (cinfo->next_scanline < cinfo->image_height) {
+    const size_t next = cinfo->next_scanline;
     const size_t chromaFirst = next / 2;
 
     if (lumaScratch == nullptr && (needsScratch(luma, next, 16, lumaExtent) ||
                                    (!semiPlanar && (needsScratch(cbPlane, chromaFirst, 8, chromaExtent) ||
                                                     needsScratch(crPlane, chromaFirst, 8, chromaExtent))))) {
-      lumaScratch = allocateImageBytes(&cinfo, 16 * lumaExtent + 2 * 8 * chromaExtent);
+      lumaScratch = allocateImageBytes(cinfo, 16 * lumaExtent + 2 * 8 * chromaExtent);
       cbScratch = lumaScratch + 16 * lumaExtent;
       crScratch = cbScratch + 8 * chromaExtent;
     }
@@ -294,12 +316,8 @@ bool compressYuv(const YuvFrame& frame, const Session& session) {
 
     // The library takes one band of 16 rows and advances next_scanline by 16; a zero count
     // would mean it took nothing, and looping on would never end.
-    if (jpeg_write_raw_data(&cinfo, planes, 16) == 0) ERREXIT(&cinfo, JERR_CANT_SUSPEND);
+    if (jpeg_write_raw_data(cinfo, planes, 16) == 0) ERREXIT(cinfo, JERR_CANT_SUSPEND);
   }
-
-  jpeg_finish_compress(&cinfo);
-  jpeg_destroy_compress(&cinfo);
-  return true;
 }
 
 // ---------------------------------------------------------------------------------------------
@@ -314,32 +332,20 @@ struct PackedFrame {
   ImageFormat format;
 };
 
-bool compressPacked(const PackedFrame& frame, const Session& session) {
-  jpeg_compress_struct cinfo;
-  std::memset(&cinfo, 0, sizeof cinfo);  // a failed create then leaves nothing to free
-  ErrorManager err;
-  Destination dest;
-  cinfo.err = jpeg_std_error(&err.pub);
-  err.pub.error_exit = jumpBackOnFatalError;
-  if (setjmp(err.jump)) {
-    jpeg_destroy_compress(&cinfo);
-    return false;
-  }
-  jpeg_create_compress(&cinfo);
-  attachDestination(&cinfo, &dest, session);
+void compressPacked(j_compress_ptr cinfo, const PackedFrame& frame, const Session& session) {
 
-  cinfo.image_width = static_cast<JDIMENSION>(frame.width);
-  cinfo.image_height = static_cast<JDIMENSION>(frame.height);
+  cinfo->image_width = static_cast<JDIMENSION>(frame.width);
+  cinfo->image_height = static_cast<JDIMENSION>(frame.height);
   const bool grey = frame.numChannels < 2;
-  cinfo.input_components = grey ? 1 : 3;
-  cinfo.in_color_space = grey ? JCS_GRAYSCALE : JCS_RGB;
-  jpeg_set_defaults(&cinfo);
-  jpeg_set_quality(&cinfo, session.quality, TRUE);
-  jpeg_start_compress(&cinfo, TRUE);  // rejects sizes the library cannot handle
+  cinfo->input_components = grey ? 1 : 3;
+  cinfo->in_color_space = grey ? JCS_GRAYSCALE : JCS_RGB;
+  jpeg_set_defaults(cinfo);
+  jpeg_set_quality(cinfo, session.quality, TRUE);
+  jpeg_start_compress(cinfo, TRUE);  // rejects sizes the library cannot handle
 
   const size_t width = static_cast<size_t>(frame.width);
   const bool asIs = frame.format == OrzaVSMobile::RGB;
-  JSAMPLE* converted = (!grey && !asIs) ? allocateImageBytes(&cinfo, 3 * width) : nullptr;
+  JSAMPLE* converted = (!grey && !asIs) ? allocateImageBytes(cinfo, 3 * width) : nullptr;
 
   for (int r = 0; r < frame.height; ++r) {
     const uint8_t* src = frame.pixels + r * frame.stride;
@@ -359,41 +365,52 @@ bool compressPacked(const PackedFrame& frame, const Session& session) {
       }
       row = converted;
     }
-    if (jpeg_write_scanlines(&cinfo, &row, 1) != 1) ERREXIT(&cinfo, JERR_CANT_SUSPEND);
+    if (jpeg_write_scanlines(cinfo, &row, 1) != 1) ERREXIT(cinfo, JERR_CANT_SUSPEND);
   }
+}
 
-  jpeg_finish_compress(&cinfo);
-  jpeg_destroy_compress(&cinfo);
-  return true;
+// Runs the error frame for `frame` and hands the library's message to `failure` if it fails.
+// A failed growth of the caller's vectors is rethrown once the compressor is gone.
+template <class Frame>
+bool encode(const Frame& frame, void (*compress)(j_compress_ptr, const Frame&, const Session&),
+            std::vector<uint8_t>& output, int32_t quality, std::vector<uint8_t>& work,
+            std::string* failure) {
+  std::exception_ptr growthFailure;
+  char reason[JMSG_LENGTH_MAX] = "";
+  const Session session{&work, &output, &growthFailure, clampQuality(quality), reason};
+  const bool ok = compressIn(frame, session, compress);
+  if (growthFailure) std::rethrow_exception(growthFailure);
+  if (!ok && failure != nullptr) *failure = reason;
+  return ok;
+}
+
+bool refuse(std::string* failure, const char* reason) {
+  if (failure != nullptr) *failure = reason;
+  return false;
 }
 
 }  // namespace
 
 bool encodeYUVToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32_t /*stride*/,
                      OrzaVSMobile::ImageFormat format, std::vector<uint8_t>& output, int32_t quality,
-                     std::vector<uint8_t>& work) {
+                     std::vector<uint8_t>& work, std::string* failure) {
   work.resize(kWorkBufferSize);
   output.clear();
 
   // Outside input: frames without pixels, without area, or in a layout this encoder does not
   // know are refused here, before any byte is read.
-  if (pixels == nullptr || width <= 0 || height <= 0) return false;
+  if (pixels == nullptr || width <= 0 || height <= 0) return refuse(failure, "no pixels or no area");
   if (format != OrzaVSMobile::I420 && format != OrzaVSMobile::NV21 && format != OrzaVSMobile::NV12)
-    return false;
+    return refuse(failure, "not a YUV 4:2:0 format");
   const uint64_t lumaLen = static_cast<uint64_t>(width) * static_cast<uint64_t>(height);
-  if (lumaLen + 2 * (lumaLen / 4) > kMaxFrameBytes) return false;
-
-  std::exception_ptr growthFailure;
-  const Session session{&work, &output, &growthFailure, clampQuality(quality)};
-  const YuvFrame frame{pixels, width, height, format};
-  const bool ok = compressYuv(frame, session);
-  if (growthFailure) std::rethrow_exception(growthFailure);
-  return ok;
+  if (lumaLen + 2 * (lumaLen / 4) > kMaxFrameBytes) return refuse(failure, "frame too large");
+  return encode(YuvFrame{pixels, width, height, format}, &compressYuv, output, quality, work,
+                failure);
 }
 
 bool encodePackedToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32_t stride,
                         int32_t numChannels, OrzaVSMobile::ImageFormat format, std::vector<uint8_t>& output,
-                        int32_t quality, std::vector<uint8_t>& work) {
+                        int32_t quality, std::vector<uint8_t>& work, std::string* failure) {
   work.resize(kWorkBufferSize);
   output.clear();
 
@@ -403,18 +420,14 @@ bool encodePackedToJpeg(const uint8_t* pixels, int32_t height, int32_t width, in
   //    width * numChannels bytes the frame holds (3 bytes a pixel for any count of 2 or more);
   //  - a negative stride: rows would lie before `pixels`, outside the memory handed over.
   // A stride smaller than a row is accepted: the rows then overlap inside the frame.
-  if (pixels == nullptr || width <= 0 || height <= 0) return false;
-  if (numChannels < 1 || numChannels == 2 || stride < 0) return false;
+  if (pixels == nullptr || width <= 0 || height <= 0) return refuse(failure, "no pixels or no area");
+  if (numChannels < 1 || numChannels == 2 || stride < 0)
+    return refuse(failure, "invalid channel count or stride");
   const uint64_t span = static_cast<uint64_t>(height - 1) * static_cast<uint64_t>(stride) +
                         static_cast<uint64_t>(width) * static_cast<uint64_t>(numChannels);
-  if (span > kMaxFrameBytes) return false;
-
-  std::exception_ptr growthFailure;
-  const Session session{&work, &output, &growthFailure, clampQuality(quality)};
-  const PackedFrame frame{pixels, width, height, stride, numChannels, format};
-  const bool ok = compressPacked(frame, session);
-  if (growthFailure) std::rethrow_exception(growthFailure);
-  return ok;
+  if (span > kMaxFrameBytes) return refuse(failure, "frame too large");
+  return encode(PackedFrame{pixels, width, height, stride, numChannels, format}, &compressPacked,
+                output, quality, work, failure);
 }
 
 }  // namespace Tovra

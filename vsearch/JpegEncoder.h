@@ -2,6 +2,7 @@
 #define ORZAVS_VSEARCH_JPEGENCODER_H
 
 #include <cstdint>
+#include <string>
 #include <vector>
 
 #include "types/ImageFormat.h"
@@ -12,6 +13,8 @@ namespace Tovra {
 // success; `work` is a scratch buffer (resized to 4096 bytes) that the library writes into and
 // that is flushed into `output` a whole block at a time. Quality is clamped to [0, 100]. A fatal
 // library error returns false (nothing thrown, nothing printed); `output` must then be ignored.
+// On false, a non-null `failure` receives the reason: the library's own message, or what made
+// the frame unacceptable before the library was called.
 // Only a failure of `output` or `work` to grow is thrown (std::bad_alloc from the vector).
 // Safe to call from several threads at once with distinct vectors.
 
@@ -25,7 +28,7 @@ namespace Tovra {
 // reading anything for null pixels, a width or height below 1, or a format other than these three.
 bool encodeYUVToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32_t stride,
                      OrzaVSMobile::ImageFormat format, std::vector<uint8_t>& output, int32_t quality,
-                     std::vector<uint8_t>& work);
+                     std::vector<uint8_t>& work, std::string* failure = nullptr);
 
 // Packed RGB, BGR(A) or grey rows, each starting `stride` bytes after the previous one; the frame
 // spans (height-1)*stride + width*numChannels bytes and nothing outside it is read.
@@ -35,7 +38,8 @@ bool encodeYUVToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32
 // library is handed). A stride below the row length is accepted: rows then overlap.
 bool encodePackedToJpeg(const uint8_t* pixels, int32_t height, int32_t width, int32_t stride,
                         int32_t numChannels, OrzaVSMobile::ImageFormat format,
-                        std::vector<uint8_t>& output, int32_t quality, std::vector<uint8_t>& work);
+                        std::vector<uint8_t>& output, int32_t quality, std::vector<uint8_t>& work,
+                        std::string* failure = nullptr);
 
 }  // namespace Tovra
 

@@ -2,16 +2,19 @@
 
 #include <algorithm>
 #include <chrono>
-#include <cstdio>
 #include <exception>
 #include <thread>
 
+#include "types/DiagnosticOutput.h"
 #include "types/ImageFormat.h"
 #include "vsearch/JpegEncoder.h"
 #include "vsearch/VisualSearchRequest.h"
 #include "vsearch/VisualSearchResponseParser.h"
 
 namespace Tovra {
+
+using OrzaVSMobile::reportLine;
+using OrzaVSMobile::reportLinef;
 
 namespace {
 
@@ -72,12 +75,12 @@ void VisualSearchServiceJob::waitUntilSettled() const {
 void VisualSearchServiceJob::cancel() { state_.store(Finished); }
 
 std::string VisualSearchServiceJob::lastQueryId() const {
-  std::lock_guard<std::mutex> lock(lastQueryMutex_);
+  MutexLock lock(lastQueryMutex_);
   return lastQueryId_;
 }
 
 double VisualSearchServiceJob::lastQueryRoundTripTime() const {
-  std::lock_guard<std::mutex> lock(lastQueryMutex_);
+  MutexLock lock(lastQueryMutex_);
   return lastQueryRoundTripTime_;
 }
 
@@ -116,7 +119,7 @@ void VisualSearchServiceJob::run() {
     // The record's geometry and its pixel storage both come from the client; an encoder handed
     // a geometry its storage does not cover would read outside it.
     if (!recordCoversImage(record)) {
-      std::printf("Skipped frame %llu: its pixels do not cover a %dx%d image\n",
+      reportLinef("Skipped frame %llu: its pixels do not cover a %dx%d image",
                   static_cast<unsigned long long>(record.frameId), record.width, record.height);
       state_.store(Finished);
       return;
@@ -145,7 +148,7 @@ void VisualSearchServiceJob::run() {
     std::string queryId;
     double roundTrip = -1.0;
     {
-      std::lock_guard<std::mutex> lock(lastQueryMutex_);
+      MutexLock lock(lastQueryMutex_);
       queryId = lastQueryId_;
       roundTrip = lastQueryRoundTripTime_;
     }
@@ -165,14 +168,14 @@ void VisualSearchServiceJob::run() {
   } catch (const std::exception& e) {
     // Out of memory while building, or a transport that threw. This may run on a worker
     // thread, where an escaping exception would end the process: the frame is given up.
-    std::printf("Visual search request failed: %s\n", e.what());
+    reportLinef("Visual search request failed: %s", e.what());
     int32_t expected = Running;
     if (!state_.compare_exchange_strong(expected, Finished)) {
       expected = AwaitingReply;
       state_.compare_exchange_strong(expected, Finished);
     }
   } catch (...) {
-    std::puts("Visual search request failed");
+    reportLine("Visual search request failed");
     int32_t expected = Running;
     if (!state_.compare_exchange_strong(expected, Finished)) {
       expected = AwaitingReply;
@@ -210,12 +213,12 @@ void VisualSearchServiceJob::handleServerResponse(const Server::ServerResponse& 
                  : Server::RESPONSE_PARSE_ERROR;
   }
   {
-    std::lock_guard<std::mutex> lock(lastQueryMutex_);
+    MutexLock lock(lastQueryMutex_);
     lastQueryId_ = metadata.queryID;
     lastQueryRoundTripTime_ = response.roundtripTime;
   }
   if (status != Server::RESPONSE_SUCCESS) {
-    std::printf("VSS SERVER ERROR: response: %s\n", response.responseStr.c_str());
+    reportLinef("VSS SERVER ERROR: response: %s", response.responseStr.c_str());
     if (eventDelegate_ != nullptr) {
       eventDelegate_->didReceiveServerError(VISUAL_SEARCH_SERVICE_MOD, status, response.responseCode);
     }

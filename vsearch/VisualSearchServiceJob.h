@@ -4,7 +4,6 @@
 #include <atomic>
 #include <cstdint>
 #include <memory>
-#include <mutex>
 #include <string>
 #include <vector>
 
@@ -14,6 +13,7 @@
 #include "server/ServerRequest.h"
 #include "server/ServerResponse.h"
 #include "types/EventDelegateBase.h"
+#include "types/Mutex.h"
 
 namespace Tovra {
 
@@ -84,9 +84,9 @@ class VisualSearchServiceJob : public Server::ServerResponseHandler, public Job 
   std::vector<uint8_t> jpegOutput_;
   Server::ServerRequest request_;
 
-  mutable std::mutex lastQueryMutex_;
-  std::string lastQueryId_;
-  double lastQueryRoundTripTime_ = -1.0;
+  mutable Mutex lastQueryMutex_;
+  std::string lastQueryId_ ORZAVS_GUARDED_BY(lastQueryMutex_);
+  double lastQueryRoundTripTime_ ORZAVS_GUARDED_BY(lastQueryMutex_) = -1.0;
 
   EventDelegateBase* eventDelegate_ = nullptr;        // not owned
   Server::ServerDelegate* serverDelegate_ = nullptr;  // not owned

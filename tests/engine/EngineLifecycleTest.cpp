@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/StdoutCapture.h"
 
 namespace {
 
@@ -128,7 +129,7 @@ TEST(EngineFacade, DoNothingOperationsAreAcceptedSilentlyInEveryState) {
     EXPECT_EQ(requirement.minHeight, 320);
     EXPECT_EQ(requirement.maxHeight, 720);
   };
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   doNothing();
   facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport, "props are ignored");
   facade.startEngine();
@@ -137,7 +138,7 @@ TEST(EngineFacade, DoNothingOperationsAreAcceptedSilentlyInEveryState) {
   doNothing();
   facade.stopEngine();
   doNothing();
-  EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
+  EXPECT_EQ(printed.text(), "");
   EXPECT_EQ(counts, (std::map<std::string, uint32_t>{{"frames", 3}}));
   EXPECT_EQ(values, (std::map<std::string, double>{{"fps", 29.5}}));
 }
@@ -151,7 +152,7 @@ TEST(EngineFacade, ANullEventDelegateMeansNoCallbacks) {
   std::vector<uint8_t> pixels = orzavs_test::makeFrame(64, 48, 64, OrzaVSMobile::GRAY);
   OrzaVSMobile::ImageBuffer image(0, OrzaVSMobile::GRAY, 64, 48, 64, 1, pixels.data());
   OrzaVSMobile::ExtraFrameData extra;
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   facade.processSingleImage(image, extra);
   // The transport counts a reply once pushServerResponse has returned on its own thread, which
   // can be just after processSingleImage saw the reply handled.
@@ -159,7 +160,7 @@ TEST(EngineFacade, ANullEventDelegateMeansNoCallbacks) {
   facade.process(image, extra);
   ASSERT_TRUE(orzavs_test::waitFor([&] { return transport.pushedCount() == 2; }));
   facade.stopEngine();
-  EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
+  EXPECT_EQ(printed.text(), "");
 }
 
 }  // namespace

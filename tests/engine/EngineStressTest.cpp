@@ -18,6 +18,7 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/StdoutCapture.h"
 
 namespace {
 
@@ -79,7 +80,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   const auto start = orzavs_test::Clock::now();
   auto now = [start] { return std::chrono::duration<double>(orzavs_test::Clock::now() - start).count(); };
   std::atomic<bool> stop{false};
-  testing::internal::CaptureStdout();  // lines about frames skipped while not running
+  orzavs_test::StdoutCapture printed;  // lines about frames skipped while not running
   std::vector<std::thread> threads;
   for (int c = 0; c < 3; ++c) {
     threads.emplace_back([&, c] {
@@ -165,7 +166,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   engine.reset();
   ASSERT_TRUE(waitFor([&] { return transport.idle(); }));
   EXPECT_EQ(transport.pendingCount(), 0u);
-  testing::internal::GetCapturedStdout();
+  printed.text();
   std::printf("stress: %zu frames, %zu requests, %zu decodes, %zu errors, %zu never answered\n",
               events.frames.load(), transport.sentCount(), events.decodes, events.errors, transport.droppedCount());
 }

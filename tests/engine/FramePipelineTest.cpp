@@ -10,6 +10,7 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/StdoutCapture.h"
 #include "vsearch/VisualSearchRequest.h"
 
 namespace {
@@ -142,7 +143,7 @@ TEST_F(PipelineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
   EXPECT_EQ(frameIdOf(transport.sent()[0].id), "0");  // the lent record itself was sent
   ASSERT_TRUE(jobIdle());
 
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   ImageBuffer image(0, OrzaVSMobile::NV21, kW, kH, kW, 1, textured.data());
   engine.process("no-such-key", image, extra);  // like an empty key: no line
   std::vector<ImageBuffer> buffers(5);
@@ -164,7 +165,7 @@ TEST_F(PipelineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
     engine.process(keys[i], buffers[i], extra);
     EXPECT_EQ(buffers[i].data, nullptr) << i;
   }
-  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+  EXPECT_EQ(printed.text(),
             "Failed to get a new frame record slot in getRequestImageBuffers\n"
             "Failed to process non-GRAY/YUV format in continuous scanning mode\n"
             "Skipped input frame: row stride 63 is smaller than a row of 64 bytes\n"
@@ -193,21 +194,21 @@ TEST_F(PipelineTest, BadFramesPrintOneLineAndLeaveTheEngineWorking) {
        ImageBuffer(0, static_cast<OrzaVSMobile::ImageFormat>(8), kW, kH, kW, 1, textured.data())}};
   ExtraFrameData extra;
   for (auto c : cases) {
-    testing::internal::CaptureStdout();
+    orzavs_test::StdoutCapture printed;
     engine.process("", c.image, extra);
-    EXPECT_EQ(testing::internal::GetCapturedStdout(), c.line);
+    EXPECT_EQ(printed.text(), c.line);
   }
   EXPECT_TRUE(events.pointCounts().empty());
   EXPECT_EQ(engine.lastTakenTime(), -1.0);
   // Outside RUNNING: the defined lines, nothing lent, nothing processed.
   engine.pauseEngine();
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   ImageBuffer other = lendable(OrzaVSMobile::GRAY);
   std::string key = "kept";
   engine.requestImageBuffer(other, key);
   engine.process(key, cases[1].image, extra);
   engine.processSingleImage(cases[1].image, extra);
-  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+  EXPECT_EQ(printed.text(),
             "Failed to request image buffer: TSE not in RUNNING state\n"
             "Skipped input frame: TSE not in RUNNING state\n"
             "Skipped input frame: TSE not in RUNNING state\n");
@@ -235,11 +236,11 @@ TEST_F(PipelineTest, SingleImageReturnsOnlyAfterTheReplyWasHandled) {
     r.responseCode = 500;
     return true;
   });
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   engine.processSingleImage(image, extra);
   ImageBuffer narrow(0, OrzaVSMobile::BGR, kW, kH, kW * 2, 3, bgr.data());
   engine.processSingleImage(narrow, extra);
-  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+  EXPECT_EQ(printed.text(),
             "VSS SERVER ERROR: response: \n"
             "Skipped input frame: row stride 128 is smaller than a row of 192 bytes\n");
   ASSERT_EQ(events.errors().size(), 1u);

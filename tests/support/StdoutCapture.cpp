@@ -1,22 +1,23 @@
 #include "support/StdoutCapture.h"
 
-#include <gtest/gtest.h>
-
-#include <cstdio>
+#include "types/Diagnostics.h"
 
 namespace orzavs_test {
 
-StdoutCapture::StdoutCapture() {
-  std::fflush(stdout);
-  testing::internal::CaptureStdout();
-}
+StdoutCapture::StdoutCapture() { OrzaVSMobile::setDiagnosticSink(&StdoutCapture::record, this); }
 
 StdoutCapture::~StdoutCapture() { text(); }
 
+void StdoutCapture::record(void* self, const char* line) {
+  // Lines are delivered one at a time, and none after text() has put the default sink back.
+  std::string& text = static_cast<StdoutCapture*>(self)->text_;
+  text += line;
+  text += '\n';
+}
+
 const std::string& StdoutCapture::text() {
   if (active_) {
-    std::fflush(stdout);
-    text_ = testing::internal::GetCapturedStdout();
+    OrzaVSMobile::setDiagnosticSink(nullptr, nullptr);
     active_ = false;
   }
   return text_;

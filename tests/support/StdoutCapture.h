@@ -5,9 +5,10 @@
 
 namespace orzavs_test {
 
-// Captures everything written to standard output (file descriptor 1, so puts/printf from any
-// thread included) between construction and text(). Only one capture may be active at a time
-// in a process; the destructor ends a capture that text() did not collect.
+// Records every line the library prints (its diagnostic sink, from any thread), each followed by
+// a newline: the text the default sink would have written to standard output. Installed from
+// construction until text() or the destructor, which put the default sink back; only one may be
+// active at a time.
 class StdoutCapture {
  public:
   StdoutCapture();
@@ -15,11 +16,12 @@ class StdoutCapture {
   StdoutCapture(const StdoutCapture&) = delete;
   StdoutCapture& operator=(const StdoutCapture&) = delete;
 
-  // Ends the capture (flushing stdio first) and returns what was written. Later calls return
-  // the same text.
+  // Ends the recording and returns what was printed. Later calls return the same text.
   const std::string& text();
 
  private:
+  static void record(void* self, const char* line);
+
   bool active_ = true;
   std::string text_;
 };

@@ -327,22 +327,30 @@ TEST(JpegEncoder, UnusableArgumentsAreRefusedAndOverlappingRowsAccepted) {
   EXPECT_TRUE(decodeJpeg(packedJpeg(std::vector<uint8_t>(9 * 6 + 4 * 8, 9), 8, 10, 6, 4, BGRA)).ok);
 }
 
-// Sizes the library refuses raise its fatal error, which comes back as false: nothing thrown,
-// nothing printed, nothing leaked (under the leak checker), and the next call works.
+// Sizes the library refuses raise its fatal error, which comes back as false with the library's
+// message: nothing thrown, nothing printed, nothing leaked (under the leak checker), and the next
+// call works.
 TEST(JpegEncoder, LibraryErrorsBecomeFalse) {
   orzavs_test::StdoutCapture capture;
   std::vector<uint8_t> out, work;
   const std::vector<uint8_t> wide(70000 * 2 * 3 / 2, 0x80);  // 70000 x 2 in any layout
+  const std::string tooBig = "Maximum supported image dimension is 65500 pixels";
   for (ImageFormat format : kYuvFormats) {
     bool ok = true;
-    EXPECT_NO_THROW(ok = encodeYUVToJpeg(wide.data(), 2, 70000, 70000, format, out, 50, work));
+    std::string reason;
+    EXPECT_NO_THROW(ok = encodeYUVToJpeg(wide.data(), 2, 70000, 70000, format, out, 50, work, &reason));
     EXPECT_FALSE(ok);
+    EXPECT_EQ(reason, tooBig);
     EXPECT_NO_THROW(ok = encodeYUVToJpeg(wide.data(), 70000, 2, 2, format, out, 50, work));
     EXPECT_FALSE(ok);
   }
   bool ok = true;
-  EXPECT_NO_THROW(ok = encodePackedToJpeg(wide.data(), 1, 70000, 0, 3, BGR, out, 50, work));
+  std::string reason;
+  EXPECT_NO_THROW(ok = encodePackedToJpeg(wide.data(), 1, 70000, 0, 3, BGR, out, 50, work, &reason));
   EXPECT_FALSE(ok);
+  EXPECT_EQ(reason, tooBig);
+  EXPECT_FALSE(encodePackedToJpeg(wide.data(), 1, 8, 0, 2, BGR, out, 50, work, &reason));
+  EXPECT_EQ(reason, "invalid channel count or stride");
   EXPECT_EQ(capture.text(), "");
   EXPECT_TRUE(decodeJpeg(yuvJpeg(packYuv(makeYuv(32, 32), NV21), 32, 32, NV21)).ok);
 }

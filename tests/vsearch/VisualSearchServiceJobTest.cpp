@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/StdoutCapture.h"
 #include "vsearch/JpegTestSupport.h"
 
 namespace {
@@ -88,13 +89,13 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
   shortYuv->pixels.resize(32 * 32);
   auto shortPacked = makeRecord(32, 32, OrzaVSMobile::BGRA);
   shortPacked->numChannels = 4;
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   for (const auto& bad : {shortYuv, shortPacked}) {
     job->setFrameRecord(bad);
     job->run();
     EXPECT_EQ(job->state(), Tovra::Finished);
   }
-  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+  EXPECT_EQ(printed.text(),
             "Skipped frame 7: its pixels do not cover a 32x32 image\n"
             "Skipped frame 7: its pixels do not cover a 32x32 image\n");
   EXPECT_EQ(transport.sentCount(), 0u);
@@ -102,11 +103,11 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
 
 TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
   std::string id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
-  testing::internal::CaptureStdout();
+  orzavs_test::StdoutCapture printed;
   transport.pushServerResponse(reply(id, 404, "not found"));
   id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
   transport.pushServerResponse(reply(id, 200, "{\"queryId\":"));
-  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+  EXPECT_EQ(printed.text(),
             "VSS SERVER ERROR: response: not found\nVSS SERVER ERROR: response: {\"queryId\":\n");
   ASSERT_EQ(events.errors().size(), 2u);
   EXPECT_EQ(events.errors()[0].module, Tovra::VISUAL_SEARCH_SERVICE_MOD);

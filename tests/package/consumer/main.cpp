@@ -2,6 +2,7 @@
 #include <OrzaVSMobile.h>
 
 #include <cstdio>
+#include <string>
 #include <vector>
 
 namespace {
@@ -22,6 +23,9 @@ class Transport : public Tovra::Server::ServerDelegate {
   }
 };
 
+// Keeps the last diagnostic line the library printed.
+void keepLine(void* lastLine, const char* line) { *static_cast<std::string*>(lastLine) = line; }
+
 }  // namespace
 
 int main() {
@@ -39,8 +43,18 @@ int main() {
   buffer.allocateBuffer(64);
   const int32_t filled = buffer.fillBuffer(pixels.data(), 64);
 
-  std::printf("camera %d-%d, filled %d, module %s\n", requirement.minHeight,
+  std::string lastLine;
+  OrzaVSMobile::setDiagnosticSink(&keepLine, &lastLine);
+  {
+    Tovra::TovraStateEngineFacade facade(&events);
+    OrzaVSMobile::ExtraFrameData extra;
+    facade.process(buffer, extra);  // not started: refused with a line
+  }
+  OrzaVSMobile::setDiagnosticSink(nullptr, nullptr);
+
+  std::printf("camera %d-%d, filled %d, module %s, line '%s'\n", requirement.minHeight,
               requirement.maxHeight, filled,
-              Tovra::ObjectModuleIDNames.at(Tovra::VISUAL_SEARCH_SERVICE_MOD).c_str());
+              Tovra::ObjectModuleIDNames.at(Tovra::VISUAL_SEARCH_SERVICE_MOD).c_str(),
+              lastLine.c_str());
   return filled == 64 ? 0 : 1;
 }

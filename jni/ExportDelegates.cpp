@@ -6,6 +6,7 @@
 #include <string>
 
 #include "jni/Directors.h"
+#include "jni/FrameNatives.h"
 #include "jni/TypeNames.h"
 
 using namespace orzavs::jni;
@@ -54,7 +55,10 @@ void changeOwnership(JNIEnv* env, jobject jself, jlong handle, jboolean takeOrRe
 
 // ---- module ---------------------------------------------------------------------------------------
 
-ORZAVS_JNI_EXPORT(void, swig_1module_1init)(JNIEnv* env, jclass cls) { Swig::initModule(env, cls); }
+ORZAVS_JNI_EXPORT(void, swig_1module_1init)(JNIEnv* env, jclass cls) {
+  Swig::initModule(env, cls);
+  registerFrameNatives(env);
+}
 
 // ---- EventDelegateBase ----------------------------------------------------------------------------
 

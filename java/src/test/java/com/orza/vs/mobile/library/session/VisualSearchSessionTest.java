@@ -1,14 +1,10 @@
 package com.orza.vs.mobile.library.session;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertNotNull;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.mobile.library.impl.jni.ContentType;
 import com.orza.vs.mobile.library.impl.jni.ImageBuffer;
+import com.orza.vs.mobile.library.impl.jni.ResponseStatus;
 import com.orza.vs.mobile.library.impl.jni.ServerDelegate;
 import com.orza.vs.mobile.library.impl.jni.ServerRequest;
 import com.orza.vs.mobile.library.impl.jni.ServerResponse;
@@ -20,7 +16,6 @@ import java.util.Random;
 import java.util.concurrent.LinkedBlockingQueue;
 import java.util.concurrent.TimeUnit;
 import org.junit.jupiter.api.AfterEach;
-import org.junit.jupiter.api.BeforeEach;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
 
@@ -35,14 +30,13 @@ class VisualSearchSessionTest {
       + "{\"tlx\":10,\"tly\":20,\"trx\":110,\"try\":20,\"brx\":110,\"bry\":90,\"blx\":10,\"bly\":90}}}],"
       + "\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[\"q-0\"]}}}";
 
-  /** Answers nothing by itself: the test takes each request (id, JPEG) and pushes the reply. */
+  /** Keeps each request (id, JPEG) until the test answers it. */
   static final class Transport extends ServerDelegate {
     final LinkedBlockingQueue<Object[]> requests = new LinkedBlockingQueue<Object[]>();
 
     @Override
     public boolean sendServerRequestImpl(ServerRequest request) {
-      requests.add(new Object[] {request.getId(), request.getData().getData()});
-      return true;
+      return requests.add(new Object[] {request.getId(), request.getData().getData()});
     }
 
     byte[] answer(int code, String body) throws InterruptedException {
@@ -58,41 +52,34 @@ class VisualSearchSessionTest {
     }
   }
 
-  static final class Listener implements SessionListener {
-    final List<SearchResults> results = new ArrayList<SearchResults>();
-    final List<Integer> errors = new ArrayList<Integer>();
-    float[] points;
-
+  final Transport transport = new Transport();
+  final List<Object> heard = new ArrayList<Object>();
+  final SessionListener listener = new SessionListener() {
     @Override
     public void onInterestPoints(float[] xy) {
-      points = xy;
+      heard.add(xy);
     }
 
     @Override
-    public void onResults(SearchResults r) {
-      results.add(r);
+    public void onResults(SearchResults results) {
+      heard.add(results);
     }
 
     @Override
-    public void onServerError(com.orza.vs.mobile.library.impl.jni.ResponseStatus status, int code) {
-      errors.add(code);
+    public void onServerError(ResponseStatus status, int code) {
+      heard.add(code);
     }
-  }
-
-  final Transport transport = new Transport();
-  final Listener listener = new Listener();
-  VisualSearchSession session;
+  };
+  final VisualSearchSession session = VisualSearchSession.builder().transport(transport).listener(listener).build();
   final byte[] y = new byte[W * H];
   final byte[] u = new byte[W * H / 4];
   final byte[] v = new byte[W * H / 4];
 
-  @BeforeEach
-  void setUp() {
+  VisualSearchSessionTest() {
     Random random = new Random(7);
     random.nextBytes(y);
     random.nextBytes(u);
     random.nextBytes(v);
-    session = VisualSearchSession.builder().transport(transport).listener(listener).build();
   }
 
   @AfterEach
@@ -110,53 +97,32 @@ class VisualSearchSessionTest {
     return out;
   }
 
-  /** Camera planes: rows of `stride` bytes; chroma interleaved (pixel stride 2) or planar. */
-  static final class Layout {
-    final String name;
-    final int stride;
-    final int pixelStride;
-    final boolean oneBlock;
-    final boolean vFirst;
-    final int wrapped;
-
-    Layout(String name, int stride, int pixelStride, boolean oneBlock, boolean vFirst, int wrapped) {
-      this.name = name;
-      this.stride = stride;
-      this.pixelStride = pixelStride;
-      this.oneBlock = oneBlock;
-      this.vFirst = vFirst;
-      this.wrapped = wrapped;
-    }
-  }
-
-  static final Layout[] LAYOUTS = {
-    new Layout("NV21 in one block", W, 2, true, true, 1),
-    new Layout("NV12 in one block", W, 2, true, false, 2),
-    // The last chroma row's padding lies past the planes, so the engine must not read them in place.
-    new Layout("NV21 in one block, padded rows", W + 16, 2, true, true, -1),
-    new Layout("NV21 chroma apart, padded rows", W + 16, 2, false, true, -1),
-    new Layout("NV12 chroma apart", W, 2, false, false, -1),
-    new Layout("I420-like planes, padded rows", W + 8, 1, false, false, -1),
+  // Camera layouts: row stride, chroma pixel stride, all planes in one block, V before U, and
+  // what wrapPlanes answers (1 NV21 / 2 NV12 read in place, -1 copied). Planes end after their
+  // last sample, as Android's do: so a padded last chroma row lies past them and forces a copy.
+  static final int[][] LAYOUTS = {
+    {W, 2, 1, 1, 1}, {W, 2, 1, 0, 2}, {W + 16, 2, 1, 1, -1}, {W + 16, 2, 0, 1, -1}, {W, 2, 0, 0, -1},
+    {W + 8, 1, 0, 0, -1},
   };
 
-  /** Y, U, V buffers for a layout; planes apart end after their last sample, as Android's do. */
-  ByteBuffer[] planes(Layout l) {
-    int chromaRows = H / 2;
-    int chromaLength = (chromaRows - 1) * l.stride + (W / 2 - 1) * l.pixelStride + 1;
-    ByteBuffer block = ByteBuffer.allocateDirect(l.stride * H + (l.pixelStride == 2 ? l.stride * chromaRows : 0));
-    ByteBuffer yb = l.oneBlock ? block : ByteBuffer.allocateDirect((H - 1) * l.stride + W);
-    ByteBuffer chroma = l.oneBlock ? block : ByteBuffer.allocateDirect(l.stride * chromaRows);
-    int base = l.oneBlock ? l.stride * H : 0;
-    ByteBuffer ub = l.pixelStride == 2 ? chroma : ByteBuffer.allocateDirect(chromaLength);
-    ByteBuffer vb = l.pixelStride == 2 ? chroma : ByteBuffer.allocateDirect(chromaLength);
-    for (int r = 0; r < H; r++) for (int c = 0; c < W; c++) yb.put(r * l.stride + c, y[r * W + c]);
-    int uAt = l.pixelStride == 2 ? base + (l.vFirst ? 1 : 0) : 0;
-    int vAt = l.pixelStride == 2 ? base + (l.vFirst ? 0 : 1) : 0;
-    for (int r = 0; r < chromaRows; r++) {
-      for (int c = 0; c < W / 2; c++) {
-        ub.put(uAt + r * l.stride + c * l.pixelStride, u[r * W / 2 + c]);
-        vb.put(vAt + r * l.stride + c * l.pixelStride, v[r * W / 2 + c]);
-      }
+  ByteBuffer[] planes(int[] l) {
+    int stride = l[0];
+    int ps = l[1];
+    boolean oneBlock = l[2] == 1;
+    int chromaLength = (H / 2 - 1) * stride + (W / 2 - 1) * ps + 1;
+    ByteBuffer block = ByteBuffer.allocateDirect(stride * H + (ps == 2 ? stride * H / 2 : 0));
+    ByteBuffer yb = oneBlock ? block : ByteBuffer.allocateDirect((H - 1) * stride + W);
+    ByteBuffer chroma = oneBlock ? block : ByteBuffer.allocateDirect(stride * H / 2);
+    ByteBuffer ub = ps == 2 ? chroma : ByteBuffer.allocateDirect(chromaLength);
+    ByteBuffer vb = ps == 2 ? chroma : ByteBuffer.allocateDirect(chromaLength);
+    int base = oneBlock ? stride * H : 0;
+    int uAt = ps == 2 ? base + l[3] : 0;
+    int vAt = ps == 2 ? base + 1 - l[3] : 0;
+    for (int r = 0; r < H; r++) for (int c = 0; c < W; c++) yb.put(r * stride + c, y[r * W + c]);
+    for (int i = 0; i < u.length; i++) {
+      int at = i / (W / 2) * stride + i % (W / 2) * ps;
+      ub.put(uAt + at, u[i]);
+      vb.put(vAt + at, v[i]);
     }
     return new ByteBuffer[] {yb, slice(ub, uAt, chromaLength), slice(vb, vAt, chromaLength)};
   }
@@ -168,63 +134,51 @@ class VisualSearchSessionTest {
     return d.slice();
   }
 
-  /** One frame through a fresh start; returns the JPEG the engine sent for it. */
-  byte[] scan(Executable submit) throws Throwable {
+  /** One frame after a fresh start, answered with `code`; returns the JPEG the engine sent. */
+  byte[] scan(int code, Executable submit) throws Throwable {
     session.pause();
     session.start();
     submit.execute();
-    return transport.answer(200, REPLY);
+    return transport.answer(code, code == 200 ? REPLY : "busy");
   }
 
   @Test
-  void everyPlaneLayoutGivesTheEngineTheFramePackedNv21Gives() throws Throwable {
+  void everyLayoutReachesTheEngineAsPackedNv21AndResultsAreOwned() throws Throwable {
     assertFalse(session.processNv21(nv21(), W, H, 0), "not started: the frame is refused");
-    byte[] reference = scan(() -> assertTrue(session.processNv21(nv21(), W, H, 1_000_000_000L)));
-    assertTrue(listener.points.length > 0 && listener.points.length % 2 == 0, "interest points as x,y pairs");
-    ByteBuffer direct = ByteBuffer.allocateDirect(W * H * 3 / 2);
-    direct.put(nv21());
-    assertArrayEquals(reference, scan(() -> session.processNv21(direct, W, H, 0)), "direct NV21");
+    byte[] reference = scan(200, () -> assertTrue(session.processNv21(nv21(), W, H, 1_000_000_000L)));
+    float[] points = (float[]) heard.get(0);
+    assertTrue(points.length > 0 && points.length % 2 == 0 && points[0] < W && points[1] < H, "x,y pairs");
+    ByteBuffer direct = ByteBuffer.allocateDirect(W * H * 3 / 2).put(nv21());
+    assertArrayEquals(reference, scan(200, () -> session.processNv21(direct, W, H, 0)), "direct NV21");
     ImageBuffer probe = new ImageBuffer();
-    for (Layout l : LAYOUTS) {
+    for (int[] l : LAYOUTS) {
+      String name = Arrays.toString(l);
       ByteBuffer[] p = planes(l);
-      assertEquals(l.wrapped, FrameNatives.wrapPlanes(ImageBuffer.getCPtr(probe), p[0], l.stride, p[1], p[2],
-          l.stride, l.pixelStride, W, H), l.name + ": read in place or copied");
-      byte[] jpeg = scan(() -> assertTrue(session.processYuv420(W, H, p[0], l.stride, p[1], p[2], l.stride,
-          l.pixelStride, 0)));
-      assertArrayEquals(reference, jpeg, l.name);
+      assertEquals(l[4], FrameNatives.wrapPlanes(ImageBuffer.getCPtr(probe), p[0], l[0], p[1], p[2], l[0], l[1], W, H),
+          name + ": read in place or copied");
+      assertArrayEquals(reference, scan(200, () -> assertTrue(
+          session.processYuv420(W, H, p[0], l[0], p[1], p[2], l[0], l[1], 0))), name);
     }
     probe.delete();
-    assertEquals(2 + LAYOUTS.length, listener.results.size());
-  }
-
-  @Test
-  void resultsAndErrorsArriveAsOwnedValues() throws Throwable {
-    scan(() -> session.processNv21(nv21(), W, H, 0));
-    scan(() -> session.processNv21(nv21(), W, H, 0));
-    transport.requests.clear();
-    session.pause();
-    session.start();
-    session.processNv21(nv21(), W, H, 0);
-    transport.answer(503, "busy");
+    scan(503, () -> session.processNv21(nv21(), W, H, 0));
     session.close();
-    SearchResults r = listener.results.get(0);  // read after the session and its engine are gone
-    assertEquals("q-1", r.queryId());
-    assertTrue(r.isFinal());
-    assertEquals(Arrays.asList("q-0"), r.accumulatedQueries());
-    assertEquals(2, r.results().size());
+    // Read after the session and its engine are gone.
+    List<SearchResults> results = new ArrayList<SearchResults>();
+    for (Object o : heard) if (o instanceof SearchResults) results.add((SearchResults) o);
+    assertEquals(2 + LAYOUTS.length, results.size());
+    assertEquals(503, heard.get(heard.size() - 1));
+    SearchResults r = results.get(0);
+    assertEquals(Arrays.asList("q-1", true, Arrays.asList("q-0"), 2),
+        Arrays.asList(r.queryId(), r.isFinal(), r.accumulatedQueries(), r.results().size()));
     SearchResult shoe = r.results().get(0);
-    assertEquals(ContentType.PIDN, shoe.contentType());
-    assertEquals("shoe", shoe.content());
-    assertEquals("{\"brand\":\"x\"}", shoe.properties());
-    assertEquals("lace", shoe.subResults().get(0).content());
+    assertEquals(Arrays.asList(ContentType.PIDN, "shoe", "{\"brand\":\"x\"}", "lace"),
+        Arrays.asList(shoe.contentType(), shoe.content(), shoe.properties(), shoe.subResults().get(0).content()));
     assertEquals(ContentType.BOUNDING_BOX, r.results().get(1).contentType());
     assertArrayEquals(new float[] {10, 20, 110, 20, 110, 90, 10, 90}, r.results().get(1).location());
-    assertEquals(Arrays.asList(503), listener.errors);
   }
 
   @Test
   void lifecycle() {
-    assertFalse(session.isRunning());
     session.start();
     assertTrue(session.processNv21(nv21(), W, H, 0));
     session.pause();
@@ -255,7 +209,8 @@ class VisualSearchSessionTest {
       {IllegalArgumentException.class, "V plane holds", yuv(p[0], W, p[1], slice(p[2], 0, 100), W, 2, W)},
       {IllegalArgumentException.class, "row stride 2 is shorter", yuv(p[0], W, p[1], p[2], 2, 2, W)},
       {IllegalArgumentException.class, "NV21 frame holds 10 bytes", (Executable) () -> session.processNv21(new byte[10], W, H, 0)},
-      {IllegalArgumentException.class, "NV21 frame holds 10 bytes", (Executable) () -> session.processNv21(ByteBuffer.allocateDirect(10), W, H, 0)},
+      {IllegalArgumentException.class, "NV21 frame holds 10 bytes",
+        (Executable) () -> session.processNv21(ByteBuffer.allocateDirect(10), W, H, 0)},
       {NullPointerException.class, "NV21 frame is null", (Executable) () -> session.processNv21((byte[]) null, W, H, 0)},
     };
     for (Object[] c : cases) {
@@ -263,7 +218,7 @@ class VisualSearchSessionTest {
       Throwable e = assertThrows((Class<Throwable>) c[0], (Executable) c[2], (String) c[1]);
       assertTrue(e.getMessage().contains((String) c[1]), e.getMessage());
     }
-    assertTrue(scan(() -> session.processNv21(nv21(), W, H, 0)).length > 0, "the session still works");
+    assertTrue(scan(200, () -> session.processNv21(nv21(), W, H, 0)).length > 0, "the session still works");
   }
 
   Executable yuv(ByteBuffer yb, int yStride, ByteBuffer ub, ByteBuffer vb, int uvStride, int ps, int width) {

@@ -182,27 +182,12 @@ public final class SessionBench {
     }
   }
 
-  static double median(double[] values) {
-    return JavaBench.median(values);
-  }
-
   public static void main(String[] args) {
-    int count = 300;
-    int rounds = 5;
-    for (int i = 0; i < args.length; i++) {
-      if (args[i].equals("--size") && i + 1 < args.length) {
-        String[] wh = args[++i].split("x");
-        width = Integer.parseInt(wh[0]);
-        height = Integer.parseInt(wh[1]);
-      } else if (args[i].equals("--frames") && i + 1 < args.length) {
-        count = Integer.parseInt(args[++i]);
-      } else if (args[i].equals("--rounds") && i + 1 < args.length) {
-        rounds = Integer.parseInt(args[++i]);
-      } else {
-        System.out.println("usage: SessionBench [--size WxH] [--frames N] [--rounds R]");
-        System.exit(args[i].equals("--help") ? 0 : 2);
-      }
-    }
+    int[] o = JavaBench.options("SessionBench", args);
+    width = o[0];
+    height = o[1];
+    int count = o[2];
+    int rounds = o[3];
     makeFrames();
     String[] names = {
       "low-level loop, NV21 byte[]", "session, NV21 byte[]",
@@ -226,10 +211,10 @@ public final class SessionBench {
     System.out.printf(Locale.ROOT, "%-34s %10s %10s %14s%n", "loop (baseline, then compared)", "fps", "us/frame",
         "vs baseline");
     for (int l = 0; l < loops.length; l++) {
-      double m = median(fps[l]);
+      double m = JavaBench.median(fps[l]);
       String versus = "";
       if (l % 2 == 1) {
-        double base = median(fps[l - 1]);
+        double base = JavaBench.median(fps[l - 1]);
         versus = String.format(Locale.ROOT, "%+.1f%% time", (base / m - 1) * 100);
       }
       System.out.printf(Locale.ROOT, "%-34s %10.1f %10.1f %14s%n", names[l], m, 1e6 / m, versus);

@@ -113,13 +113,17 @@ Planes planesOf(JNIEnv* env, jobject y, jint yRowStride, jobject u, jobject v, j
   return p;
 }
 
-// Whether [first, first + count) is covered by the luminance plane followed directly by the
-// two chroma views: then the engine may read the frame where it lies.
-bool coversFrame(const Planes& p, const uint8_t* chroma, int64_t frameBytes) {
-  const uint8_t* end = p.y.data + frameBytes;
-  const uint8_t* yEnd = p.y.data + p.y.capacity;
-  const uint8_t* chromaEnd = std::max(p.u.data + p.u.capacity, p.v.data + p.v.capacity);
-  return yEnd >= chroma && chromaEnd >= end;
+// Addresses as numbers: the planes are separate objects, so where one lies relative to another
+// is compared without pointer arithmetic across them.
+uintptr_t addressOf(const uint8_t* p, int64_t offset = 0) {
+  return reinterpret_cast<uintptr_t>(p) + static_cast<uintptr_t>(offset);
+}
+
+// Whether the luminance plane runs up to `chroma` and the two chroma views reach the end of a
+// frame of `frameBytes`: then every byte the engine reads lies inside the given buffers.
+bool coversFrame(const Planes& p, uintptr_t chroma, int64_t frameBytes) {
+  const uintptr_t chromaEnd = std::max(addressOf(p.u.data, p.u.capacity), addressOf(p.v.data, p.v.capacity));
+  return addressOf(p.y.data, p.y.capacity) >= chroma && chromaEnd >= addressOf(p.y.data, frameBytes);
 }
 
 // Lends the planes to the image when they already are one NV21 or NV12 block (chroma pairs
@@ -134,11 +138,13 @@ jint wrapPlanes(JNIEnv* env, jclass, jlong imageHandle, jobject y, jint yRowStri
     const int64_t lumaBytes = int64_t{yRowStride} * height;
     const int64_t frameBytes = lumaBytes * 3 / 2;
     if (frameBytes > INT32_MAX) return -1;
-    const uint8_t* chromaStart = p.y.data + lumaBytes;
+    const uintptr_t chromaStart = addressOf(p.y.data, lumaBytes);
+    const uintptr_t u0 = addressOf(p.u.data);
+    const uintptr_t v0 = addressOf(p.v.data);
     ImageFormat format;
-    if (p.v.data == chromaStart && p.u.data == chromaStart + 1) {
+    if (v0 == chromaStart && u0 == chromaStart + 1) {
       format = ImageFormat::NV21;
-    } else if (p.u.data == chromaStart && p.v.data == chromaStart + 1) {
+    } else if (u0 == chromaStart && v0 == chromaStart + 1) {
       format = ImageFormat::NV12;
     } else {
       return -1;
@@ -205,7 +211,7 @@ void copyPlanes(JNIEnv* env, jclass, jlong imageHandle, jobject y, jint yRowStri
       uint8_t* dst = chroma + row * step;
       const uint8_t* vRow = p.v.data + row * p.v.rowStride;
       const uint8_t* uRow = p.u.data + row * p.u.rowStride;
-      if (ps == 2 && uRow == vRow + 1) {
+      if (ps == 2 && addressOf(uRow) == addressOf(vRow, 1)) {
         std::memcpy(dst, vRow, static_cast<size_t>(width));  // already V,U pairs
         continue;
       }

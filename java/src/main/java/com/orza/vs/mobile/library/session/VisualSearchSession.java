@@ -81,7 +81,6 @@ public final class VisualSearchSession implements AutoCloseable {
   private final Object frameLock = new Object();
   private final TovraStateEngineFacade engine;
   private final Events events;
-  private final ServerDelegate transport;
   private final HttpServerDelegate ownTransport;  // built from a URL: closed and deleted here
   private final ImageBuffer image = new ImageBuffer();
   private final ExtraFrameData extra = new ExtraFrameData();
@@ -101,7 +100,6 @@ public final class VisualSearchSession implements AutoCloseable {
 
   private VisualSearchSession(ServerDelegate transport, HttpServerDelegate ownTransport,
                               SessionListener listener) {
-    this.transport = transport;
     this.ownTransport = ownTransport;
     this.events = overridesInterestPoints(listener) ? new EventsWithPoints(listener) : new Events(listener);
     this.engine = new TovraStateEngineFacade(events);
@@ -150,7 +148,8 @@ public final class VisualSearchSession implements AutoCloseable {
   /**
    * Stops the engine and frees everything the session made: the engine, the built-in transport
    * (whose unanswered queries end with an error), the frame buffers. A transport given to the
-   * builder stays the application's. Idempotent.
+   * builder stays the application's. Idempotent. Not from a listener method: the built-in
+   * transport would wait for its own thread.
    */
   @Override
   public void close() {

@@ -7,6 +7,7 @@
 
 #include "jni/DiagnosticsListener.h"
 #include "jni/Directors.h"
+#include "jni/FrameNatives.h"
 #include "jni/TypeNames.h"
 
 using namespace orzavs::jni;
@@ -58,6 +59,7 @@ void changeOwnership(JNIEnv* env, jobject jself, jlong handle, jboolean takeOrRe
 ORZAVS_JNI_EXPORT(void, swig_1module_1init)(JNIEnv* env, jclass cls) {
   Swig::initModule(env, cls);
   orzavs::jni::registerDiagnosticsNatives(env);
+  registerFrameNatives(env);
 }
 
 // ---- EventDelegateBase ----------------------------------------------------------------------------

@@ -11,6 +11,7 @@ packages=(
   libjpeg62-turbo-dev nlohmann-json3-dev
   libgtest-dev libgmock-dev libbenchmark-dev
   openjdk-17-jdk-headless junit5
+  maven libmaven-compiler-plugin-java libmaven-resources-plugin-java libexec-maven-plugin-java
   g++-arm-linux-gnueabihf qemu-user
   python3 curl
 )

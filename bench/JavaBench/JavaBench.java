@@ -112,25 +112,35 @@ public final class JavaBench {
     return n % 2 == 1 ? sorted[n / 2] : (sorted[n / 2 - 1] + sorted[n / 2]) / 2;
   }
 
-  public static void main(String[] args) {
-    int width = 1280;
-    int height = 720;
-    int count = 300;
-    int rounds = 5;
+  /**
+   * The options both benchmarks take: {width, height, frames a round, rounds}; prints the usage
+   * of {@code name} and exits on anything else.
+   */
+  static int[] options(String name, String[] args) {
+    int[] o = {1280, 720, 300, 5};
     for (int i = 0; i < args.length; i++) {
       if (args[i].equals("--size") && i + 1 < args.length) {
         String[] wh = args[++i].split("x");
-        width = Integer.parseInt(wh[0]);
-        height = Integer.parseInt(wh[1]);
+        o[0] = Integer.parseInt(wh[0]);
+        o[1] = Integer.parseInt(wh[1]);
       } else if (args[i].equals("--frames") && i + 1 < args.length) {
-        count = Integer.parseInt(args[++i]);
+        o[2] = Integer.parseInt(args[++i]);
       } else if (args[i].equals("--rounds") && i + 1 < args.length) {
-        rounds = Integer.parseInt(args[++i]);
+        o[3] = Integer.parseInt(args[++i]);
       } else {
-        System.out.println("usage: JavaBench [--size WxH] [--frames N] [--rounds R]");
+        System.out.println("usage: " + name + " [--size WxH] [--frames N] [--rounds R]");
         System.exit(args[i].equals("--help") ? 0 : 2);
       }
     }
+    return o;
+  }
+
+  public static void main(String[] args) {
+    int[] o = options("JavaBench", args);
+    int width = o[0];
+    int height = o[1];
+    int count = o[2];
+    int rounds = o[3];
     System.load(System.getProperty("orzavs.javabench.native"));
     ByteBuffer[] frames = makeFrames(width, height, 8);
     long[] points = new long[1];

@@ -224,9 +224,18 @@ public final class Recognizer implements AutoCloseable {
     return small;
   }
 
-  /** The product seen in {@code frame}, or null when none is verified. */
+  /**
+   * The product seen in {@code frame}, or null when none is verified. A frame in which nothing
+   * is found is searched once more at half the size, where motion blur spans half as many
+   * pixels and the corner detector finds the edges it smeared.
+   */
   public synchronized Match find(BufferedImage frame) {
     double scale = Math.min(1.0, (double) QUERY_SIDE / Math.max(frame.getWidth(), frame.getHeight()));
+    Match m = find(frame, scale);
+    return m != null ? m : find(frame, scale / 2);
+  }
+
+  private Match find(BufferedImage frame, double scale) {
     Mat grey = grey(frame, scale);
     MatOfKeyPoint kp = new MatOfKeyPoint();
     Mat d = new Mat();

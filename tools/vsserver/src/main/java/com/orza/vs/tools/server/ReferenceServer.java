@@ -421,7 +421,7 @@ public final class ReferenceServer implements AutoCloseable {
         "",
         "  --catalog DIR     products to recognise: one PNG/JPEG per product (id = file name without",
         "                    extension), optional DIR/catalog.json {id: {title, searchTerms, url}};",
-        "                    default: the built-in catalogue of six photographs",
+        "                    default: the built-in catalogue of five photographs",
         "  --bench           time indexing and queries on a 200-product catalogue (the catalogue's",
         "                    products plus distractors) and exit",
         "  --host ADDR       address to bind (default 127.0.0.1, loopback only; 0.0.0.0 exposes it to the network)",

@@ -43,7 +43,7 @@ final class ResultsFile {
       List<Object> corners = null;
       if (x.location != null) {
         corners = new ArrayList<>();
-        for (int i = 0; i < 8; i += 2) corners.add(List.of((double) x.location[i], (double) x.location[i + 1]));
+        for (int i = 0; i < 8; i += 2) corners.add(List.of(Math.round(x.location[i] * 10) / 10.0, Math.round(x.location[i + 1] * 10) / 10.0));
       }
       e.put("corners", corners);
       if (!x.subContents.isEmpty()) e.put("subContents", results(x.subContents));

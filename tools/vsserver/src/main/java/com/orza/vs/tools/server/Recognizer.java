@@ -31,7 +31,7 @@ import org.opencv.features2d.ORB;
  * <p>The index is built once; {@link #find} is serialised (OpenCV's matcher objects are not
  * shared between threads).
  */
-public final class Recognizer implements AutoCloseable {
+public final class Recognizer {
   /** Longest side of a product image as it is indexed, and of a query frame as it is searched. */
   static final int PRODUCT_SIDE = 480;
   static final int QUERY_SIDE = 800;
@@ -307,7 +307,7 @@ public final class Recognizer implements AutoCloseable {
   }
 
   /** Applies the row-major 3x3 homography to x,y pairs; null when a point falls behind the camera. */
-  static double[] project(double[] h, double[] xy) {
+  public static double[] project(double[] h, double[] xy) {
     double[] out = new double[xy.length];
     for (int i = 0; i < xy.length; i += 2) {
       double w = h[6] * xy[i] + h[7] * xy[i + 1] + h[8];
@@ -337,10 +337,5 @@ public final class Recognizer implements AutoCloseable {
     area /= 2;
     double frameArea = (double) frameW * frameH;
     return area >= 0.002 * frameArea && area <= 4 * frameArea;
-  }
-
-  @Override
-  public void close() {
-    // The matcher and detector are released with their Java objects; nothing else is held.
   }
 }

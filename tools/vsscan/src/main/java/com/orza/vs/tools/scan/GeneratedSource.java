@@ -54,7 +54,7 @@ public final class GeneratedSource implements FrameSource {
     for (int i = 0; i < frames; i++) {
       // Mostly a steady hand (1-3 px of blur), with jerks that smear the frame over many pixels.
       double u = rnd.nextDouble();
-      blur[i] = u < 0.25 ? 7 + 11 * rnd.nextDouble() : 1 + 2.5 * rnd.nextDouble();
+      blur[i] = u < 0.25 ? 6 + 10 * rnd.nextDouble() : 1 + 2.5 * rnd.nextDouble();
       angle += 0.5 * (rnd.nextDouble() - 0.5);
       blurAngle[i] = angle;
     }

@@ -187,7 +187,7 @@ public final class Recognizer {
         "indexParams:",
         "   - { name: algorithm, type: 9, value: 6 }", // FLANN_INDEX_LSH
         "   - { name: table_number, type: 4, value: 6 }",
-        "   - { name: key_size, type: 4, value: 16 }",
+        "   - { name: key_size, type: 4, value: 18 }",
         "   - { name: multi_probe_level, type: 4, value: 1 }",
         "searchParams:",
         "   - { name: checks, type: 4, value: 32 }",

@@ -20,7 +20,7 @@ import javax.imageio.ImageIO;
  */
 final class RecognitionBench {
   static final int PRODUCTS = 200;
-  static final int VIEWS = 4;
+  static final int VIEWS = 8;
 
   private RecognitionBench() {}
 

@@ -1,8 +1,9 @@
 #!/usr/bin/env bash
 # See the library work: installs what is missing (scripts/install-deps.sh), builds the library and
 # the scanning tool (the same CMake build as scripts/test.sh, in build/), then scans the built-in
-# scene -- a textured card moving over a background -- through the engine, with the built-in
-# reference server answering on loopback, and writes an HTML report.
+# scene -- photographed products held in turn before a hand-held camera -- through the engine,
+# with the built-in reference server recognising them on loopback, and writes an HTML report
+# with the recognition figures.
 #   scripts/scan.sh                   built-in scene, report in ./scan-report/index.html
 #   scripts/scan.sh DIR|FILE [opts]   any vsscan arguments (scripts/scan.sh --help lists them)
 set -euo pipefail

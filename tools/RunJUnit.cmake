@@ -3,7 +3,7 @@
 # code: the tools draw their text with a built-in pixel font, so nothing of theirs should enter
 # the JDK's font code either).
 #   cmake -DJAVA=... -DJUNIT=<console launcher jar> -DCLASSPATH=<a:b:c> -DSCAN=<jar or dir>
-#         [-DLIBRARY=<native library>] -P RunJUnit.cmake
+#         [-DLIBRARY=<native library>] [-DJVM_ARGS=<a;b>] -P RunJUnit.cmake
 
 foreach(var JAVA JUNIT CLASSPATH SCAN)
   if(NOT DEFINED ${var})
@@ -11,7 +11,7 @@ foreach(var JAVA JUNIT CLASSPATH SCAN)
   endif()
 endforeach()
 
-set(jvm_args -Xcheck:jni -Djava.awt.headless=true)
+set(jvm_args -Xcheck:jni -Djava.awt.headless=true ${JVM_ARGS})
 if(DEFINED LIBRARY)
   list(APPEND jvm_args -Dorzavs.library.path=${LIBRARY})
 endif()

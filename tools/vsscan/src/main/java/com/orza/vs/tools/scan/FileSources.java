@@ -12,6 +12,7 @@ import java.nio.charset.StandardCharsets;
 import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.List;
+import java.util.Map;
 import java.util.Locale;
 import javax.imageio.ImageIO;
 
@@ -27,10 +28,10 @@ public final class FileSources {
    * raw NV21 stream (any other file; needs {@code size} as {width, height}).
    */
   public static FrameSource open(File path, int[] size, double fps, int repeat) throws IOException {
-    if (path.isDirectory()) return new ImageFolder(imagesIn(path), fps, repeat, "images in " + path);
+    if (path.isDirectory()) return new ImageFolder(imagesIn(path), fps, repeat, "images in " + path, Truth.load(path));
     if (!path.isFile()) throw new IOException("no such file or folder: " + path);
     String name = path.getName().toLowerCase(Locale.ROOT);
-    if (isImageName(name)) return new ImageFolder(Arrays.asList(path), fps, repeat, "image " + path);
+    if (isImageName(name)) return new ImageFolder(Arrays.asList(path), fps, repeat, "image " + path, null);
     if (name.endsWith(".y4m")) return new Y4m(path, fps);
     if (size == null) throw new IOException(path + ": a raw NV21 stream needs --size WxH");
     return new RawNv21(path, size[0], size[1], fps > 0 ? fps : 30);
@@ -59,12 +60,15 @@ public final class FileSources {
     private final double fps;
     private final int repeat;
     private final String description;
+    /** File name -> truth, from the folder's truth.json; null without one. */
+    private final Map<String, Truth> truth;
     private int fileIndex;
     private int repeatIndex;
     private int frameIndex;
     private Frame current;
 
-    ImageFolder(List<File> files, double fps, int repeat, String description) {
+    ImageFolder(List<File> files, double fps, int repeat, String description, Map<String, Truth> truth) {
+      this.truth = truth;
       this.files = files;
       this.fps = fps > 0 ? fps : 5; // time stamps 0.2 s apart: the engine takes every image
       this.repeat = Math.max(1, repeat);
@@ -82,6 +86,9 @@ public final class FileSources {
         current = Yuv.toNv21(img, 0);
       }
       Frame out = new Frame(frameIndex++, current.width, current.height, current.format, current.data.clone());
+      out.file = files.get(fileIndex).getName();
+      // A file the truth does not list shows no product.
+      if (truth != null) out.truth = truth.getOrDefault(out.file, new Truth(null, null));
       if (++repeatIndex >= repeat) {
         repeatIndex = 0;
         fileIndex++;

@@ -11,6 +11,10 @@ public final class Frame {
   public final int height;
   public final int format;
   public final byte[] data;
+  /** What the frame shows, when the source knows it; else null. */
+  public Truth truth;
+  /** The image file the frame was read from, for sources that are folders; else null. */
+  public String file;
 
   public Frame(int index, int width, int height, int format, byte[] data) {
     if (width <= 0 || height <= 0 || (width & 1) != 0 || (height & 1) != 0) {

@@ -49,7 +49,8 @@ public final class ReportWriter {
   private ReportWriter() {}
 
   /** Writes the report into {@code dir} (created if needed) and returns the HTML file. */
-  public static File write(File dir, ScanLog log, Summary summary, Info info) throws IOException {
+  /** Writes the report; {@code m} holds the recognition figures when the source had a truth, else null. */
+  public static File write(File dir, ScanLog log, Summary summary, Measurements m, Info info) throws IOException {
     File framesDir = new File(dir, "frames");
     if (!framesDir.isDirectory() && !framesDir.mkdirs()) throw new IOException("cannot create " + framesDir);
     List<ScanLog.FrameEntry> frames = log.frames();
@@ -73,7 +74,7 @@ public final class ReportWriter {
 
     File html = new File(dir, "index.html");
     try (Writer w = new OutputStreamWriter(Files.newOutputStream(html.toPath()), StandardCharsets.UTF_8)) {
-      w.write(page(log, summary, info, frames, requests, cards.toString(), requests.size() > MAX_CARDS));
+      w.write(page(log, summary, m, info, frames, requests, cards.toString(), requests.size() > MAX_CARDS));
     }
     return html;
   }
@@ -302,7 +303,7 @@ public final class ReportWriter {
     return s.length() <= n ? s : s.substring(0, n) + "...";
   }
 
-  private static String page(ScanLog log, Summary s, Info info, List<ScanLog.FrameEntry> frames,
+  private static String page(ScanLog log, Summary s, Measurements m, Info info, List<ScanLog.FrameEntry> frames,
                              List<ScanLog.RequestEntry> requests, String cards, boolean capped) {
     StringBuilder b = new StringBuilder(cards.length() + 16384);
     b.append("<!DOCTYPE html>\n<html lang=\"en\"><head><meta charset=\"utf-8\">\n<title>").append(esc(info.title))
@@ -333,6 +334,15 @@ public final class ReportWriter {
         + "<span class=\"sw box\"></span>reply with a box <span class=\"sw ok\"></span>reply without a box "
         + "<span class=\"sw error\"></span>error <span class=\"sw open\"></span>unanswered</p></section>\n");
 
+    if (m != null) {
+      b.append("<section><h2>Recognition and frame choice</h2>\n");
+      for (String line : m.lines()) b.append("<p><b>").append(esc(line)).append("</b></p>\n");
+      b.append(m.plot()).append("\n");
+      b.append("<p class=\"legend\">bars: each frame's sharpness, coloured by the server's answer when asked about "
+          + "that frame directly; dots: the frames the engine took, coloured by the answer it got. "
+          + "<span class=\"sw ok\"></span>right product <span class=\"sw error\"></span>wrong product "
+          + "<span class=\"sw open\"></span>no product named</p></section>\n");
+    }
     b.append("<section><h2>Requests</h2>\n");
     if (requests.isEmpty()) b.append("<p class=\"muted\">The engine sent no request.</p>\n");
     if (capped) b.append("<p class=\"muted\">Only the first ").append(MAX_CARDS).append(" requests are shown.</p>\n");

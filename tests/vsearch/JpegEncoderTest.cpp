@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cstdint>
-#include <cstdlib>
 #include <string>
 #include <vector>
 
@@ -222,72 +221,6 @@ TEST(JpegEncoder, RowsPastTheBottomComeFromInsideThePlane) {
       b[sof + 6] = static_cast<uint8_t>(c.shortH);
       EXPECT_EQ(a, b);
     }
-  }
-}
-
-// The band addressing written out plainly on libjpeg's own memory destination, for frames where
-// the library reads nothing past the picture's rows and columns: the encoder must give exactly
-// its bytes (same settings, same samples, same flushing). Heights 40 and 72 make the library
-// complete the last chroma block row from work rows the previous band left behind.
-std::vector<uint8_t> plainEncode(const std::vector<uint8_t>& frame, size_t w, size_t h, ImageFormat format,
-                                 int q) {
-  jpeg_compress_struct c;
-  jpeg_error_mgr e;
-  c.err = jpeg_std_error(&e);
-  jpeg_create_compress(&c);
-  unsigned char* buffer = nullptr;
-  unsigned long size = 0;
-  jpeg_mem_dest(&c, &buffer, &size);
-  c.image_width = static_cast<JDIMENSION>(w);
-  c.image_height = static_cast<JDIMENSION>(h);
-  c.input_components = 3;
-  c.in_color_space = JCS_YCbCr;
-  jpeg_set_defaults(&c);
-  jpeg_set_quality(&c, q, TRUE);
-  jpeg_set_colorspace(&c, JCS_YCbCr);
-  c.raw_data_in = TRUE;
-  c.dct_method = JDCT_IFAST;
-  c.comp_info[0].h_samp_factor = c.comp_info[0].v_samp_factor = 2;
-  jpeg_start_compress(&c, TRUE);
-  const size_t cw = w / 2;
-  std::vector<uint8_t> cb(8 * cw), cr(8 * cw);
-  uint8_t* px = const_cast<uint8_t*>(frame.data());
-  JSAMPROW y[16], u[8], v[8];
-  JSAMPARRAY planes[3] = {y, u, v};
-  for (size_t n = 0; n < h; n = c.next_scanline) {
-    for (size_t k = 0; k < 16; ++k) y[k] = px + w * (n + k);
-    for (size_t k = 0; k < 8; ++k) {
-      u[k] = format == I420 ? px + w * h + (n * cw) / 2 + k * cw : &cb[k * cw];
-      v[k] = format == I420 ? px + w * h + (w * h) / 4 + (n * cw) / 2 + k * cw : &cr[k * cw];
-    }
-    for (size_t k = 0; format != I420 && k < std::min<size_t>((h - n) / 2, 8); ++k)
-      for (size_t i = 0; i < cw; ++i) {
-        cb[k * cw + i] = px[w * (h + n / 2 + k) + 2 * i + (format == NV21 ? 1 : 0)];
-        cr[k * cw + i] = px[w * (h + n / 2 + k) + 2 * i + (format == NV21 ? 0 : 1)];
-      }
-    jpeg_write_raw_data(&c, planes, 16);
-  }
-  jpeg_finish_compress(&c);
-  jpeg_destroy_compress(&c);
-  std::vector<uint8_t> out(buffer, buffer + size);
-  std::free(buffer);
-  return out;
-}
-
-TEST(JpegEncoder, MatchesThePlainBandAddressing) {
-  struct Case {
-    ImageFormat format;
-    int w, h, q;
-  } cases[] = {{I420, 64, 48, 50},
-               {I420, 320, 240, 90},
-               {NV21, 64, 40, 50},
-               {NV12, 96, 72, 75},
-               {NV21, 256, 192, 100}};
-  for (const Case& c : cases) {
-    const std::vector<uint8_t> frame =
-        packYuv(makeYuv(c.w, c.h, c.w == 256), c.format);  // noise: many flushes
-    EXPECT_EQ(yuvJpeg(frame, c.w, c.h, c.format, c.q), plainEncode(frame, c.w, c.h, c.format, c.q))
-        << label(c.format, c.w, c.h);
   }
 }
 

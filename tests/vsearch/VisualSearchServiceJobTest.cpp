@@ -8,6 +8,7 @@
 
 #include "support/EngineFakes.h"
 #include "support/RecordingTransport.h"
+#include "vsearch/JpegEncoder.h"
 #include "vsearch/JpegTestSupport.h"
 
 namespace {
@@ -67,6 +68,11 @@ TEST_F(JobTest, SendsADecodableJpegAndLetsGoOfTheFrame) {
     const jpeg_test::Decoded decoded = jpeg_test::decodeJpeg(sent.body);
     EXPECT_TRUE(decoded.ok && decoded.width == 40 && decoded.height == 24) << format;
     EXPECT_EQ(decoded.components, format == OrzaVSMobile::GRAY ? 1 : 3);
+    if (format == OrzaVSMobile::NV21) {  // encoded at quality 50
+      std::vector<uint8_t> expected, work;
+      ASSERT_TRUE(Tovra::encodeYUVToJpeg(record->pixels.data(), 24, 40, 40, OrzaVSMobile::NV21, expected, 50, work));
+      EXPECT_EQ(sent.body, expected);
+    }
     transport.pushServerResponse(reply(id, 200, replyBody("Q")));
   }
 }

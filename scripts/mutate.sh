@@ -139,6 +139,7 @@ m jpeg-quality-75 vsearch/VisualSearchServiceJob.cpp "$V" \
   'kJpegQuality = 50;' 'kJpegQuality = 75;'
 m quality-clamp-top vsearch/JpegEncoder.cpp "$V" \
   'if (quality >= 100) return 100;' 'if (quality >= 100) return 99;'
+# Equivalent: the library itself reads quality 0 as 1, so the tables do not change.
 m quality-clamp-bottom vsearch/JpegEncoder.cpp "$V" \
   'if (quality <= 0) return 0;' 'if (quality <= 0) return 1;'
 m chroma-order vsearch/JpegEncoder.cpp "$V" \
@@ -151,6 +152,7 @@ m roundtrip-key vsearch/VisualSearchRequest.cpp "$V" \
   '"lastQueryRoundTripTime";' '"lastQueryRoundtripTime";'
 m request-id-prefix vsearch/VisualSearchRequest.cpp "$V" \
   'kRequestIdPrefix = "TovraStateEngine-";' 'kRequestIdPrefix = "TovraStateEngine_";'
+# Equivalent while the insertion stays guarded by the "not there yet" test around it.
 m params-json-rewritten vsearch/VisualSearchRequest.cpp "$V" \
   'request.params.emplace(kParamsJsonField, visualSearchParamsJson(info.rotation));' \
   'request.params[kParamsJsonField] = visualSearchParamsJson(info.rotation);'
@@ -193,6 +195,7 @@ m threshold-40 features/InterestPoints.cpp "$F" \
   'kThreshold = 50;' 'kThreshold = 40;'
 m max-points-51 features/InterestPoints.cpp "$F" \
   'kMaxPoints = 50;' 'kMaxPoints = 51;'
+# Equivalent: with exactly 50 corners the selection leaves them in their row-major order.
 m fifty-selected features/InterestPoints.cpp "$F" \
   'if (n <= kMaxPoints) {' 'if (n < kMaxPoints) {'
 m best-scores-flipped features/InterestPoints.cpp "$F" \

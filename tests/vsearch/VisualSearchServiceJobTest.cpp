@@ -110,9 +110,13 @@ TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
   transport.pushServerResponse(reply(id, 404, "not found"));
   id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
   transport.pushServerResponse(reply(id, 200, "{\"queryId\":"));
-  EXPECT_EQ(testing::internal::GetCapturedStdout(),
-            "VSS SERVER ERROR: response: not found\nVSS SERVER ERROR: response: {\"queryId\":\n");
-  ASSERT_EQ(events.errors().size(), 2u);
+  id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
+  transport.pushServerResponse(reply(id, 201, "{}"));  // only 200 is success
+  EXPECT_EQ(testing::internal::GetCapturedStdout(), "VSS SERVER ERROR: response: not found\n"
+            "VSS SERVER ERROR: response: {\"queryId\":\nVSS SERVER ERROR: response: {}\n");
+  ASSERT_EQ(events.errors().size(), 3u);
+  EXPECT_EQ(events.errors()[2].status, Tovra::Server::RESPONSE_SERVER_ERROR);
+  EXPECT_EQ(events.errors()[2].code, 201);
   EXPECT_EQ(events.errors()[0].module, Tovra::VISUAL_SEARCH_SERVICE_MOD);
   EXPECT_EQ(events.errors()[0].status, Tovra::Server::RESPONSE_SERVER_ERROR);
   EXPECT_EQ(events.errors()[0].code, 404);

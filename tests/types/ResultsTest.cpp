@@ -3,15 +3,28 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <type_traits>
 #include <vector>
 
 #include "types/EnumNames.h"
+#include "exec/Job.h"
 #include "types/EventDelegateBase.h"
+#include "types/ImageFormat.h"
 #include "types/ObjectInfo.h"
 #include "types/ResultMetadata.h"
 
 using Tovra::ObjectInfo;
 using Tovra::ResultMetadata;
+
+// Every enumeration that crosses JNI has a fixed 32-bit underlying type, so any integer that
+// arrives from Java is a valid value of the type.
+template <typename... E>
+constexpr bool allInt32() {
+  return (std::is_same<typename std::underlying_type<E>::type, int32_t>::value && ...);
+}
+static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionID, Tovra::StatusID,
+                       Tovra::CameraStabilityIssue, Tovra::JudgeVerdictOnModule, Tovra::Server::ResponseStatus,
+                       OrzaVSMobile::ImageFormat, Tovra::JobState>(), "");
 
 TEST(ObjectInfoTest, DefaultsAndDeepCopies) {
   ObjectInfo info;

@@ -34,32 +34,52 @@ class CountingHandler : public Tovra::Server::ServerResponseHandler {
 
 }  // namespace
 
-// Requests are sent on one thread (as a job on the worker does) while several client threads
-// push the same replies at once: each id reaches its handler exactly once.
-TEST(ServerDelegateConcurrencyTest, RacingSendsAndPushesDeliverEachIdExactlyOnce) {
-  constexpr size_t kIds = 500;
+// Several client threads push the same replies at once: each id reaches its handler exactly
+// once, however the pushes interleave.
+TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
+  constexpr size_t kIds = 400;
   RecordingTransport transport;
   CountingHandler handler(kIds);
-  std::atomic<size_t> sent{0};
-  std::thread sender([&] {
-    for (size_t i = 0; i < kIds; ++i) {
-      transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
-      sent.store(i + 1);
-    }
-  });
+  for (size_t i = 0; i < kIds; ++i) transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
   std::vector<std::thread> pushers;
-  for (int p = 0; p < 3; ++p) {
-    pushers.emplace_back([&] {
-      for (size_t next = 0; next < kIds; std::this_thread::yield()) {
-        for (const size_t available = sent.load(); next < available; ++next) {
-          transport.pushServerResponse(makeResponse("r" + std::to_string(next)));
-        }
+  for (int p = 0; p < 4; ++p) {
+    pushers.emplace_back([&, p] {
+      for (size_t k = 0; k < kIds; ++k) {
+        transport.pushServerResponse(makeResponse("r" + std::to_string(p % 2 == 0 ? k : kIds - 1 - k)));
       }
     });
   }
-  sender.join();
   for (auto& t : pushers) t.join();
   for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i)) << "id r" << i;
+  EXPECT_EQ(0u, transport.pendingCount());
+}
+
+// Requests are sent on one thread while their replies are pushed on another, as a job on the
+// worker thread and the client's network thread do. The two threads keep in step through
+// relaxed counters, which order nothing: only the delegate's own lock may order its table.
+TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
+  constexpr size_t kIds = 600;
+  RecordingTransport transport;
+  CountingHandler handler(kIds);
+  std::atomic<size_t> sent{0}, pushed{0};
+  std::thread sender([&] {
+    for (size_t i = 0; i < kIds; ++i) {
+      while (i > pushed.load(std::memory_order_relaxed) + 4) std::this_thread::yield();
+      transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
+      sent.store(i + 1, std::memory_order_relaxed);
+    }
+  });
+  std::thread pusher([&] {
+    for (size_t next = 0; next < kIds; std::this_thread::yield()) {
+      for (const size_t available = sent.load(std::memory_order_relaxed); next < available; ++next) {
+        transport.pushServerResponse(makeResponse("r" + std::to_string(next)));
+        pushed.store(next + 1, std::memory_order_relaxed);
+      }
+    }
+  });
+  sender.join();
+  pusher.join();
+  for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i));
   EXPECT_EQ(0u, transport.pendingCount());
 }
 

@@ -105,14 +105,17 @@ TEST(EngineLifecycle, PauseClearsTheFrameBookkeeping) {
 }
 
 TEST(EngineFacade, DoNothingOperationsAreAcceptedSilentlyInEveryState) {
-  orzavs_test::RecordingEvents events;
   orzavs_test::FakeTransport transport;
-  Tovra::TovraStateEngineFacade facade(&events);
+  Tovra::TovraStateEngineFacade facade(nullptr);
   std::map<std::string, uint32_t> counts = {{"frames", 3}};
   std::map<std::string, double> values = {{"fps", 29.5}};
   const std::map<std::string, std::string> props = {{"k", "v"}};
-  Tovra::CameraResRequirement requirement;
-  auto doNothing = [&] {
+  orzavs_test::StdoutCapture printed;
+  for (int step = 0; step < 4; ++step) {
+    if (step == 1) facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport, "props are ignored");
+    if (step == 1) facade.startEngine();
+    if (step == 2) facade.pauseEngine();
+    if (step == 3) facade.stopEngine();
     facade.readProps("{}");
     facade.enableSingleImageMode();
     facade.disableSingleImageMode();
@@ -124,20 +127,11 @@ TEST(EngineFacade, DoNothingOperationsAreAcceptedSilentlyInEveryState) {
     facade.enableEventLogging();
     facade.saveEventLog("/nonexistent/path");
     facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, props);
-    requirement = Tovra::CameraResRequirement();
+    Tovra::CameraResRequirement requirement;
     facade.getCameraResRequirement(requirement);
     EXPECT_EQ(requirement.minHeight, 320);
     EXPECT_EQ(requirement.maxHeight, 720);
-  };
-  orzavs_test::StdoutCapture printed;
-  doNothing();
-  facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport, "props are ignored");
-  facade.startEngine();
-  doNothing();
-  facade.pauseEngine();
-  doNothing();
-  facade.stopEngine();
-  doNothing();
+  }
   EXPECT_EQ(printed.text(), "");
   EXPECT_EQ(counts, (std::map<std::string, uint32_t>{{"frames", 3}}));
   EXPECT_EQ(values, (std::map<std::string, double>{{"fps", 29.5}}));

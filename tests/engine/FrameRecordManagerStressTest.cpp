@@ -12,19 +12,16 @@
 using Tovra::FrameRecord;
 using Tovra::FrameRecordManager;
 
-// The engine's pattern: one thread takes records from the pool and fills them, other threads
-// (jobs) read them and drop their reference when done. A record must never be handed out
-// while someone else still holds it, every handed-out id is unique, and the hand-out must be
-// ordered after the previous holder's last use (ThreadSanitizer checks that part).
+// Two threads take records from the pool and fill them, two others (jobs) read them and drop
+// their reference when done. A record must never be handed out while someone else still holds
+// it, every handed-out id is unique, and each hand-out must be ordered after the previous
+// holder's last use and after the other taker's hand-outs (ThreadSanitizer checks that part).
 TEST(FrameRecordManagerStressTest, RecordsReleasedOnOtherThreadsAreReusedSafely) {
-  constexpr int kFrames = 4000;
+  constexpr int kFramesEach = 2000;
   FrameRecordManager pool(5);
-
   std::mutex queueMutex;
   std::vector<std::shared_ptr<FrameRecord>> handedOver;
-  std::atomic<bool> done{false};
-  std::atomic<int> consumed{0};
-  std::atomic<int> mismatches{0};
+  std::atomic<int> producing{2}, consumed{0}, mismatches{0};
 
   auto consumer = [&] {
     for (;;) {
@@ -37,49 +34,42 @@ TEST(FrameRecordManagerStressTest, RecordsReleasedOnOtherThreadsAreReusedSafely)
         }
       }
       if (!record) {
-        if (done.load()) return;
+        if (producing.load() == 0) return;
         std::this_thread::yield();
         continue;
       }
-      // Read everything the producer wrote; the pixels carry the frame id in every byte.
-      const uint8_t expected = static_cast<uint8_t>(record->frameId);
-      for (uint8_t byte : record->pixels) {
-        if (byte != expected) {
-          mismatches.fetch_add(1);
-          break;
-        }
-      }
-      if (record->width != static_cast<int32_t>(record->frameId % 1000)) mismatches.fetch_add(1);
+      // The pixels carry the frame id in every byte.
+      for (uint8_t byte : record->pixels) mismatches += byte != static_cast<uint8_t>(record->frameId);
+      if (record->width != static_cast<int32_t>(record->frameId % 1000)) ++mismatches;
       record.reset();  // the job lets go; the pool may hand it out again at once
-      consumed.fetch_add(1);
+      ++consumed;
     }
   };
-  std::thread consumerA(consumer);
-  std::thread consumerB(consumer);
-
-  std::set<uint64_t> ids;
-  int produced = 0;
-  while (produced < kFrames) {
-    std::shared_ptr<FrameRecord> record = pool.getNewSlot();
-    if (!record) {
-      std::this_thread::yield();
-      continue;
-    }
-    ASSERT_TRUE(ids.insert(record->frameId).second) << "frame id handed out twice";
-    record->width = static_cast<int32_t>(record->frameId % 1000);
-    record->pixels.assign(64 + produced % 64, static_cast<uint8_t>(record->frameId));
-    {
+  std::vector<uint64_t> ids[2];
+  auto producer = [&](std::vector<uint64_t>& mine) {
+    while (mine.size() < kFramesEach) {
+      std::shared_ptr<FrameRecord> record = pool.getNewSlot();
+      if (!record) {
+        std::this_thread::yield();
+        continue;
+      }
+      mine.push_back(record->frameId);
+      record->width = static_cast<int32_t>(record->frameId % 1000);
+      record->pixels.assign(64 + mine.size() % 64, static_cast<uint8_t>(record->frameId));
       std::lock_guard<std::mutex> lock(queueMutex);
       handedOver.push_back(std::move(record));
     }
-    ++produced;
-  }
-  done.store(true);
-  consumerA.join();
-  consumerB.join();
+    --producing;
+  };
+  std::thread threads[] = {std::thread(consumer), std::thread(consumer), std::thread(producer, std::ref(ids[0])),
+                           std::thread(producer, std::ref(ids[1]))};
+  for (std::thread& t : threads) t.join();
 
-  EXPECT_EQ(kFrames, consumed.load());
+  std::set<uint64_t> all(ids[0].begin(), ids[0].end());
+  all.insert(ids[1].begin(), ids[1].end());
+  EXPECT_EQ(2u * kFramesEach, all.size()) << "a frame id was handed out twice";
+  EXPECT_EQ(2u * kFramesEach - 1, *all.rbegin());
+  EXPECT_EQ(2 * kFramesEach, consumed.load());
   EXPECT_EQ(0, mismatches.load());
-  EXPECT_EQ(static_cast<uint64_t>(kFrames - 1), *ids.rbegin());
   EXPECT_TRUE(pool.restart());
 }

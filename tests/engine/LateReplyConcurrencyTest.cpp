@@ -11,6 +11,7 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/RecordingTransport.h"
 
 namespace {
 
@@ -18,10 +19,7 @@ using orzavs_test::Ms;
 using orzavs_test::waitFor;
 
 Tovra::Server::ServerResponse okReply(const std::string& id) {
-  Tovra::Server::ServerResponse r;
-  r.id = id;
-  r.responseStr = orzavs_test::replyBody(id);
-  return r;
+  return orzavs_test::makeResponse(id, orzavs_test::replyBody(id));
 }
 
 class LateReplyTest : public ::testing::Test {
@@ -52,7 +50,7 @@ class LateReplyTest : public ::testing::Test {
   std::unique_ptr<Tovra::TovraStateEngine> engine;
 };
 
-TEST_F(LateReplyTest, RepliesAfterPauseOrStopAreIgnored) {
+TEST_F(LateReplyTest, RepliesAfterPauseStopOrDeletionAreIgnored) {
   std::string stale = sendFrame(0.0);
   engine->pauseEngine();
   transport.pushServerResponse(okReply(stale));
@@ -66,9 +64,8 @@ TEST_F(LateReplyTest, RepliesAfterPauseOrStopAreIgnored) {
   engine->stopEngine();
   transport.pushServerResponse(okReply(stale));
   EXPECT_EQ(events.replyCallbacks(), 1u);
-}
 
-TEST_F(LateReplyTest, RepliesAfterDeletionFindNoHandler) {
+  engine->startEngine();
   const std::string first = sendFrame(0.0);
   engine->pauseEngine();
   engine->resumeEngine();
@@ -79,7 +76,7 @@ TEST_F(LateReplyTest, RepliesAfterDeletionFindNoHandler) {
   EXPECT_EQ(transport.pendingCount(), 0u);
   transport.pushServerResponse(okReply(first));
   transport.pushServerResponse(okReply(second));
-  EXPECT_EQ(events.replyCallbacks(), 0u);
+  EXPECT_EQ(events.replyCallbacks(), 1u);
 }
 
 TEST_F(LateReplyTest, DeletionWaitsOutADeliveryButPauseDoesNot) {

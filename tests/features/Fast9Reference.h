@@ -6,9 +6,6 @@
 // position, the corner score by binary search on the threshold, suppression by looking at the
 // 8 neighbours on a dense grid. Slow, obviously correct, small planes only.
 
-#include <sys/mman.h>
-#include <unistd.h>
-
 #include <algorithm>
 #include <cstdint>
 #include <cstring>
@@ -18,10 +15,12 @@
 #include <vector>
 
 #include "features/Fast9.h"
+#include "support/GuardedBytes.h"
 
 namespace fast9ref {
 
 using OrzaVSMobile::Fast9Corner;
+using GuardedPlane = orzavs_test::GuardedBytes;
 
 // Circle positions 0..15 as (dx, dy): straight below the centre first, then towards +x.
 constexpr int kCircle[16][2] = {{0, 3},  {1, 3},   {2, 2},   {3, 1},   {3, 0},  {3, -1},  {2, -2},  {1, -3},
@@ -101,38 +100,6 @@ inline Detection suppress(const Detection& raw) {
   }
   return kept;
 }
-
-// A plane in its own pages, placed so that its last byte ends a readable page and an
-// unreadable page follows, with another unreadable page before the first byte: a read outside
-// the (height-1)*stride + width bytes of the plane faults at once, sanitizer or not.
-class GuardedPlane {
- public:
-  GuardedPlane(const std::vector<uint8_t>& bytes) : size_(bytes.size()) {
-    const size_t page = static_cast<size_t>(sysconf(_SC_PAGESIZE));
-    const size_t dataPages = (size_ + page - 1) / page + 1;
-    length_ = (dataPages + 2) * page;
-    void* m = mmap(nullptr, length_, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    if (m == MAP_FAILED) return;
-    base_ = static_cast<uint8_t*>(m);
-    mprotect(base_, page, PROT_NONE);
-    mprotect(base_ + (dataPages + 1) * page, page, PROT_NONE);
-    data_ = base_ + (dataPages + 1) * page - size_;
-    if (size_ > 0) std::memcpy(data_, bytes.data(), size_);
-  }
-  ~GuardedPlane() {
-    if (base_ != nullptr) munmap(base_, length_);
-  }
-  GuardedPlane(const GuardedPlane&) = delete;
-  GuardedPlane& operator=(const GuardedPlane&) = delete;
-  const uint8_t* data() const { return data_; }
-  bool ok() const { return base_ != nullptr; }
-
- private:
-  size_t size_;
-  size_t length_ = 0;
-  uint8_t* base_ = nullptr;
-  uint8_t* data_ = nullptr;
-};
 
 // Exactly the bytes a plane of this geometry spans: (height-1)*stride + width.
 inline size_t planeBytes(int width, int height, int stride) {

@@ -11,10 +11,10 @@
 #include "support/RecordingTransport.h"
 #include "support/TestJob.h"
 
-using orzavs_test::Gate;
+using orzavs_test::makeRequest;
 using orzavs_test::makeResponse;
+using orzavs_test::RecordingHandler;
 using orzavs_test::RecordingTransport;
-using Tovra::Server::ServerRequest;
 using Tovra::Server::ServerResponse;
 
 namespace {
@@ -32,31 +32,20 @@ class CountingHandler : public Tovra::Server::ServerResponseHandler {
   std::vector<std::atomic<int>> counts_;
 };
 
-ServerRequest makeRequest(const std::string& id, Tovra::Server::ServerResponseHandler* handler) {
-  ServerRequest request;
-  request.id = id;
-  request.responseHandler = handler;
-  return request;
-}
-
 }  // namespace
 
 // Several client threads push the same replies at once: each id reaches its handler exactly
 // once, however the pushes interleave.
 TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
   constexpr size_t kIds = 400;
-  constexpr int kPushers = 4;
   RecordingTransport transport;
   CountingHandler handler(kIds);
-  for (size_t i = 0; i < kIds; ++i) {
-    transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
-  }
+  for (size_t i = 0; i < kIds; ++i) transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
   std::vector<std::thread> pushers;
-  for (int p = 0; p < kPushers; ++p) {
+  for (int p = 0; p < 4; ++p) {
     pushers.emplace_back([&, p] {
       for (size_t k = 0; k < kIds; ++k) {
-        const size_t i = (p % 2 == 0) ? k : kIds - 1 - k;
-        transport.pushServerResponse(makeResponse("r" + std::to_string(i)));
+        transport.pushServerResponse(makeResponse("r" + std::to_string(p % 2 == 0 ? k : kIds - 1 - k)));
       }
     });
   }
@@ -65,27 +54,27 @@ TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
   EXPECT_EQ(0u, transport.pendingCount());
 }
 
-// Requests are sent on some threads while replies are pushed on others, as a job on the
-// worker thread and the client's network thread do.
+// Requests are sent on one thread while their replies are pushed on another, as a job on the
+// worker thread and the client's network thread do. The two threads keep in step through
+// relaxed counters, which order nothing: only the delegate's own lock may order its table.
 TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
   constexpr size_t kIds = 600;
   RecordingTransport transport;
   CountingHandler handler(kIds);
-  std::atomic<size_t> sent{0};
+  std::atomic<size_t> sent{0}, pushed{0};
   std::thread sender([&] {
     for (size_t i = 0; i < kIds; ++i) {
+      while (i > pushed.load(std::memory_order_relaxed) + 4) std::this_thread::yield();
       transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
-      sent.store(i + 1);
+      sent.store(i + 1, std::memory_order_relaxed);
     }
   });
   std::thread pusher([&] {
-    size_t next = 0;
-    while (next < kIds) {
-      const size_t available = sent.load();
-      for (; next < available; ++next) {
+    for (size_t next = 0; next < kIds; std::this_thread::yield()) {
+      for (const size_t available = sent.load(std::memory_order_relaxed); next < available; ++next) {
         transport.pushServerResponse(makeResponse("r" + std::to_string(next)));
+        pushed.store(next + 1, std::memory_order_relaxed);
       }
-      std::this_thread::yield();
     }
   });
   sender.join();
@@ -98,10 +87,9 @@ TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
 // thread: only then may the handler be destroyed.
 TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
   RecordingTransport transport;
-  Gate entered;
-  Gate release;
-  std::atomic<bool> deliveryDone{false};
-  orzavs_test::RecordingHandler handler;
+  orzavs_test::Gate entered, release;
+  std::atomic<bool> deliveryDone{false}, forgotten{false};
+  RecordingHandler handler;
   handler.onResponse = [&](const ServerResponse&) {
     entered.open();
     release.wait();
@@ -110,16 +98,13 @@ TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
   transport.sendServerRequest(makeRequest("slow", &handler));
   std::thread pusher([&] { transport.pushServerResponse(makeResponse("slow")); });
   ASSERT_TRUE(entered.wait());
-
-  std::atomic<bool> forgotten{false};
   bool doneWhenForgotten = false;
   std::thread forgetter([&] {
     transport.forgetHandler(&handler);
     doneWhenForgotten = deliveryDone.load();
     forgotten.store(true);
   });
-  // Give a wrong implementation the chance to return early.
-  std::this_thread::sleep_for(std::chrono::milliseconds(50));
+  std::this_thread::sleep_for(std::chrono::milliseconds(50));  // room for an early return
   EXPECT_FALSE(forgotten.load());
   release.open();
   forgetter.join();
@@ -132,7 +117,7 @@ TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
 TEST(ServerDelegateConcurrencyTest, HandlerDestroyedAfterForgetWhileRepliesRace) {
   RecordingTransport transport;
   for (int round = 0; round < 300; ++round) {
-    auto handler = std::make_unique<orzavs_test::RecordingHandler>();
+    auto handler = std::make_unique<RecordingHandler>();
     std::atomic<int> touched{0};
     handler->onResponse = [&touched](const ServerResponse&) { touched.fetch_add(1); };
     const std::string id = "late-" + std::to_string(round);

@@ -102,19 +102,10 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   }
 
   void setResponder(Responder responder) {
-    std::lock_guard<std::mutex> lock(mutex_);
-    responder_ = std::move(responder);
+    locked([&] { responder_ = std::move(responder); });
   }
   // Answers every request with a reply whose query id is the request id.
-  void answerEverything(Ms delay = Ms(0)) {
-    setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& r, Ms& d) {
-      r.responseStr = "{\"queryId\":\"" + sent.id +
-                      "\",\"quillmark\":{\"searchResult\":[{\"content\":\"c\",\"contentType\":\"PIDN\","
-                      "\"properties\":{}}],\"resultMetadata\":{\"finalAccumulation\":true}}}";
-      d = delay;
-      return true;
-    });
-  }
+  void answerEverything(Ms delay = Ms(0));
 
   // Runs synchronously inside sendServerRequestImpl, on the sender's thread.
   std::function<void(const Tovra::Server::ServerRequest&)> onSend;
@@ -140,29 +131,16 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   }
 
   void pushLater(const Tovra::Server::ServerResponse& reply, Ms delay = Ms(0)) {
-    {
-      std::lock_guard<std::mutex> lock(mutex_);
-      queue_.push_back({reply, Clock::now() + delay});
-    }
+    locked([&] { queue_.push_back({reply, Clock::now() + delay}); });
     wake_.notify_all();
   }
 
-  std::vector<SentRequest> sent() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return sent_;
-  }
-  size_t sentCount() const { return sent().size(); }
-  size_t pushedCount() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return pushed_;
-  }
-  size_t droppedCount() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return dropped_;
-  }
+  std::vector<SentRequest> sent() const { return locked([this] { return sent_; }); }
+  size_t sentCount() const { return locked([this] { return sent_.size(); }); }
+  size_t pushedCount() const { return locked([this] { return pushed_; }); }
+  size_t droppedCount() const { return locked([this] { return dropped_; }); }
   bool idle() const {  // every queued reply pushed
-    std::lock_guard<std::mutex> lock(mutex_);
-    return queue_.empty() && !pushing_;
+    return locked([this] { return queue_.empty() && !pushing_; });
   }
 
  private:
@@ -170,6 +148,11 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     Tovra::Server::ServerResponse reply;
     Clock::time_point due;
   };
+  template <typename F>
+  auto locked(F read) const -> decltype(read()) {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return read();
+  }
 
   void loop() {
     std::unique_lock<std::mutex> lock(mutex_);
@@ -212,6 +195,14 @@ inline std::string replyBody(const std::string& queryId, const std::vector<std::
   }
   return "{\"queryId\":\"" + queryId + "\",\"quillmark\":{\"searchResult\":[" + results +
          "],\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[]}}}";
+}
+
+inline void FakeTransport::answerEverything(Ms delay) {
+  setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {
+    reply.responseStr = replyBody(sent.id);
+    d = delay;
+    return true;
+  });
 }
 
 // A frame whose first plane has isolated bright dots on dark (many corners, sharpness > 0) or,

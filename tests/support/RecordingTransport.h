@@ -1,8 +1,6 @@
 #ifndef ORZAVS_TESTS_SUPPORT_RECORDINGTRANSPORT_H
 #define ORZAVS_TESTS_SUPPORT_RECORDINGTRANSPORT_H
 
-#include <chrono>
-#include <condition_variable>
 #include <cstdint>
 #include <functional>
 #include <mutex>
@@ -13,45 +11,45 @@
 
 namespace orzavs_test {
 
-// What a transport saw of one request: copies, since the request belongs to the caller.
-struct RecordedRequest {
-  std::string id;
-  Tovra::Server::ServerRequest::ParamMap params;
-  Tovra::Server::ServerRequest::ParamMap metadata;
-  std::vector<uint8_t> body;
-  Tovra::Server::ServerResponseHandler* handler = nullptr;
-};
-
-// A server delegate whose transfer only records the request (and optionally runs a hook, e.g.
-// to answer from another thread). sendServerRequestImpl returns `result`.
+// A server delegate whose transfer only counts the request and runs `onSend` (e.g. to answer
+// from another thread); sendServerRequestImpl returns `result`.
 class RecordingTransport : public Tovra::Server::ServerDelegate {
  public:
-  bool sendServerRequestImpl(const Tovra::Server::ServerRequest& request) override;
-
-  std::vector<RecordedRequest> sent() const;
-  size_t sentCount() const;
-  // Waits until at least `n` requests were sent; false after the timeout.
-  bool waitForSent(size_t n, std::chrono::milliseconds timeout = std::chrono::seconds(10)) const;
-
-  // Runs inside sendServerRequestImpl after the request was recorded.
+  bool sendServerRequestImpl(const Tovra::Server::ServerRequest& request) override {
+    {
+      std::lock_guard<std::mutex> lock(mutex_);
+      ++sent_;
+    }
+    if (onSend) onSend(request);
+    return result;
+  }
+  size_t sentCount() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return sent_;
+  }
   std::function<void(const Tovra::Server::ServerRequest&)> onSend;
   bool result = true;
 
  private:
   mutable std::mutex mutex_;
-  mutable std::condition_variable arrived_;
-  std::vector<RecordedRequest> sent_;
+  size_t sent_ = 0;
 };
 
-// A response handler that counts and keeps copies of the responses it receives.
+// A response handler that keeps copies of the responses it receives, then runs `onResponse`.
 class RecordingHandler : public Tovra::Server::ServerResponseHandler {
  public:
-  void handleServerResponse(const Tovra::Server::ServerResponse& response) override;
-
-  std::vector<Tovra::Server::ServerResponse> responses() const;
-  size_t count() const;
-
-  // Runs inside handleServerResponse after the response was recorded.
+  void handleServerResponse(const Tovra::Server::ServerResponse& response) override {
+    {
+      std::lock_guard<std::mutex> lock(mutex_);
+      responses_.push_back(response);
+    }
+    if (onResponse) onResponse(response);
+  }
+  std::vector<Tovra::Server::ServerResponse> responses() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return responses_;
+  }
+  size_t count() const { return responses().size(); }
   std::function<void(const Tovra::Server::ServerResponse&)> onResponse;
 
  private:
@@ -59,9 +57,21 @@ class RecordingHandler : public Tovra::Server::ServerResponseHandler {
   std::vector<Tovra::Server::ServerResponse> responses_;
 };
 
-// A response with the given id and body (code 200 unless given).
-Tovra::Server::ServerResponse makeResponse(const std::string& id, const std::string& body = "",
-                                           int32_t code = 200);
+inline Tovra::Server::ServerRequest makeRequest(const std::string& id, Tovra::Server::ServerResponseHandler* handler) {
+  Tovra::Server::ServerRequest request;
+  request.id = id;
+  request.responseHandler = handler;
+  return request;
+}
+
+inline Tovra::Server::ServerResponse makeResponse(const std::string& id, const std::string& body = "",
+                                                  int32_t code = 200) {
+  Tovra::Server::ServerResponse response;
+  response.id = id;
+  response.responseStr = body;
+  response.responseCode = code;
+  return response;
+}
 
 }  // namespace orzavs_test
 

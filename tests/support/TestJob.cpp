@@ -51,7 +51,6 @@ void TestJob::finishUnlessAwaiting() {
   if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
 }
 
-void TestJob::cancel() { state_.store(Tovra::Finished); }
 
 bool TestJob::waitForState(int32_t wanted, std::chrono::milliseconds timeout) {
   const auto deadline = std::chrono::steady_clock::now() + timeout;

@@ -47,15 +47,11 @@ class TestJob : public Tovra::Job {
   void run() override;
   void finishUnlessAwaiting() override;
 
-  // The job's owner settles it Finished.
-  void cancel();
-
   // Polls every millisecond until the state is `wanted`; false after the timeout.
   bool waitForState(int32_t wanted, std::chrono::milliseconds timeout = std::chrono::seconds(10));
 
   int id() const { return id_; }
   int32_t state() const { return state_.load(); }
-  void setState(int32_t value) { state_.store(value); }
   int runs() const { return runs_.load(); }
 
   // Work done inside run(), after the state became Running.

@@ -1,11 +1,8 @@
 #ifndef ORZAVS_TESTS_VSEARCH_JPEGTESTSUPPORT_H
 #define ORZAVS_TESTS_VSEARCH_JPEGTESTSUPPORT_H
 
-// Helpers for the JPEG encoder tests: memory that ends at an unreadable page, synthetic 4:2:0
-// frames, a libjpeg decoder on a memory source and PSNR.
-
-#include <sys/mman.h>
-#include <unistd.h>
+// Helpers for the JPEG encoder tests: synthetic 4:2:0 frames, a libjpeg decoder on a memory
+// source and PSNR.
 
 #include <cmath>
 #include <csetjmp>
@@ -17,35 +14,12 @@
 
 #include <jpeglib.h>
 
+#include "support/GuardedBytes.h"
 #include "types/ImageFormat.h"
 
 namespace jpeg_test {
 
-// A copy of `bytes` that ends exactly where an inaccessible page begins: reading one byte past
-// the end faults at once, whoever reads (our code or the uninstrumented JPEG library).
-class GuardedBytes {
- public:
-  explicit GuardedBytes(const std::vector<uint8_t>& bytes) {
-    const size_t page = static_cast<size_t>(sysconf(_SC_PAGESIZE));
-    const size_t dataPages = (bytes.size() + page - 1) / page;
-    mapped_ = (dataPages + 1) * page;
-    void* base = mmap(nullptr, mapped_, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    if (base == MAP_FAILED) throw std::runtime_error("mmap failed");
-    base_ = static_cast<uint8_t*>(base);
-    if (mprotect(base_ + dataPages * page, page, PROT_NONE) != 0) throw std::runtime_error("mprotect failed");
-    data_ = base_ + dataPages * page - bytes.size();
-    if (!bytes.empty()) std::memcpy(data_, bytes.data(), bytes.size());
-  }
-  ~GuardedBytes() { munmap(base_, mapped_); }
-  GuardedBytes(const GuardedBytes&) = delete;
-  GuardedBytes& operator=(const GuardedBytes&) = delete;
-  const uint8_t* data() const { return data_; }
-
- private:
-  size_t mapped_ = 0;
-  uint8_t* base_ = nullptr;
-  uint8_t* data_ = nullptr;
-};
+using orzavs_test::GuardedBytes;
 
 // A planar 4:2:0 picture: Y is width x height, U and V are (width/2) x (height/2), the chroma
 // geometry the encoder's addressing uses.

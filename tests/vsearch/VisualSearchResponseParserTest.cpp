@@ -69,15 +69,11 @@ TEST(VisualSearchResponseParser, ReadsResultsMetadataBoxesAndNesting) {
   EXPECT_EQ(mid.subContents[0].srcObjectModule, Tovra::UNSPECIFIED_OBJECT_MOD);
 }
 
-TEST(VisualSearchResponseParser, ContentTypeTextsAreMatchedWhole) {
+TEST(VisualSearchResponseParser, TypeTextsAreMatchedWholeAndListsMayBeEmptyObjectsOrAbsent) {
   EXPECT_EQ(Tovra::visualSearchContentType("ExternalResult"), Tovra::EXTERNAL_RESULT);
-  EXPECT_EQ(Tovra::visualSearchContentType("SearchTerms"), Tovra::SEARCH_TERMS);
   for (const char* other : {"pidn", "PIDN ", "", "BOUNDING_BOX"}) {
     EXPECT_EQ(Tovra::visualSearchContentType(other), Tovra::UNSPECIFIED_CONTENT_TYPE) << other;
   }
-}
-
-TEST(VisualSearchResponseParser, ListsMayBeEmptyObjectsOrAbsent) {
   Parsed p = parse(withResults("[]"));
   EXPECT_TRUE(p.ok && p.results.empty());
   p = parse(withResults("{\"b\":" + result("PIDN", "{}") + ",\"a\":" + result("SearchTerms", "{}") + "}"));

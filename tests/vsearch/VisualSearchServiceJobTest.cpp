@@ -7,7 +7,9 @@
 #include <gtest/gtest.h>
 
 #include "support/EngineFakes.h"
+#include "support/RecordingTransport.h"
 #include "support/StdoutCapture.h"
+#include "vsearch/JpegEncoder.h"
 #include "vsearch/JpegTestSupport.h"
 
 namespace {
@@ -30,10 +32,7 @@ std::shared_ptr<FrameRecord> makeRecord(int w, int h, int format, int orient = 0
 }
 
 ServerResponse reply(const std::string& id, int code, const std::string& body, double rtt = -1.0) {
-  ServerResponse r;
-  r.id = id;
-  r.responseCode = code;
-  r.responseStr = body;
+  ServerResponse r = orzavs_test::makeResponse(id, body, code);
   r.roundtripTime = rtt;
   return r;
 }
@@ -70,6 +69,11 @@ TEST_F(JobTest, SendsADecodableJpegAndLetsGoOfTheFrame) {
     const jpeg_test::Decoded decoded = jpeg_test::decodeJpeg(sent.body);
     EXPECT_TRUE(decoded.ok && decoded.width == 40 && decoded.height == 24) << format;
     EXPECT_EQ(decoded.components, format == OrzaVSMobile::GRAY ? 1 : 3);
+    if (format == OrzaVSMobile::NV21) {  // encoded at quality 50
+      std::vector<uint8_t> expected, work;
+      ASSERT_TRUE(Tovra::encodeYUVToJpeg(record->pixels.data(), 24, 40, 40, OrzaVSMobile::NV21, expected, 50, work));
+      EXPECT_EQ(sent.body, expected);
+    }
     transport.pushServerResponse(reply(id, 200, replyBody("Q")));
   }
 }
@@ -107,9 +111,13 @@ TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
   transport.pushServerResponse(reply(id, 404, "not found"));
   id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
   transport.pushServerResponse(reply(id, 200, "{\"queryId\":"));
-  EXPECT_EQ(printed.text(),
-            "VSS SERVER ERROR: response: not found\nVSS SERVER ERROR: response: {\"queryId\":\n");
-  ASSERT_EQ(events.errors().size(), 2u);
+  id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
+  transport.pushServerResponse(reply(id, 201, "{}"));  // only 200 is success
+  EXPECT_EQ(printed.text(), "VSS SERVER ERROR: response: not found\n"
+            "VSS SERVER ERROR: response: {\"queryId\":\nVSS SERVER ERROR: response: {}\n");
+  ASSERT_EQ(events.errors().size(), 3u);
+  EXPECT_EQ(events.errors()[2].status, Tovra::Server::RESPONSE_SERVER_ERROR);
+  EXPECT_EQ(events.errors()[2].code, 201);
   EXPECT_EQ(events.errors()[0].module, Tovra::VISUAL_SEARCH_SERVICE_MOD);
   EXPECT_EQ(events.errors()[0].status, Tovra::Server::RESPONSE_SERVER_ERROR);
   EXPECT_EQ(events.errors()[0].code, 404);

@@ -13,9 +13,6 @@
 // The instructions of one call are (count(1 + n calls) - count(1 call)) / n: start-up, frame
 // preparation and the first call's buffer growth cancel out. Prints what the work found or
 // made, so that runs can be checked against each other.
-#include <jpeglib.h>
-#include <turbojpeg.h>
-
 #include <algorithm>
 #include <condition_variable>
 #include <csetjmp>
@@ -25,6 +22,10 @@
 #include <mutex>
 #include <string>
 #include <vector>
+
+// jpeglib.h needs size_t and FILE declared first.
+#include <jpeglib.h>
+#include <turbojpeg.h>
 
 #include <opencv2/core.hpp>
 #include <opencv2/features2d.hpp>

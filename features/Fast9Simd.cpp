@@ -80,17 +80,21 @@ struct VecOps {
 
 using V = VecOps::V;
 
-// Maximum over the 16 arcs of 9 contiguous positions of the arc's minimum margin.
+// Maximum over the 16 arcs of 9 contiguous positions of the arc's minimum margin. Arcs k and
+// k+1 share positions k+1 .. k+8, so the pair's best is min(min m[k+1..k+8], max(m[k], m[k+9])):
+// eight pairs (k even) need the 8-position minima at odd starts only, built from minima of 4
+// and of 2 at odd starts.
 inline V maxArcMin(const V m[16]) {
-  V a2[16], a4[16];
-#pragma GCC unroll 16
-  for (int k = 0; k < 16; ++k) a2[k] = VecOps::vmin(m[k], m[(k + 1) & 15]);
-#pragma GCC unroll 16
-  for (int k = 0; k < 16; ++k) a4[k] = VecOps::vmin(a2[k], a2[(k + 2) & 15]);
-  V best = VecOps::vmin(VecOps::vmin(a4[0], a4[4]), m[8]);
-#pragma GCC unroll 16
-  for (int k = 1; k < 16; ++k) {
-    best = VecOps::vmax(best, VecOps::vmin(VecOps::vmin(a4[k], a4[(k + 4) & 15]), m[(k + 8) & 15]));
+  V a2[8], a4[8];
+#pragma GCC unroll 8
+  for (int i = 0; i < 8; ++i) a2[i] = VecOps::vmin(m[2 * i + 1], m[(2 * i + 2) & 15]);  // m[j..j+1], j = 2i+1
+#pragma GCC unroll 8
+  for (int i = 0; i < 8; ++i) a4[i] = VecOps::vmin(a2[i], a2[(i + 1) & 7]);  // m[j..j+3]
+  V best = VecOps::vmin(VecOps::vmin(a4[0], a4[2]), VecOps::vmax(m[0], m[9]));
+#pragma GCC unroll 8
+  for (int i = 1; i < 8; ++i) {
+    const V a8 = VecOps::vmin(a4[i], a4[(i + 2) & 7]);  // m[j..j+7]
+    best = VecOps::vmax(best, VecOps::vmin(a8, VecOps::vmax(m[2 * i], m[(2 * i + 9) & 15])));
   }
   return best;
 }
@@ -135,7 +139,11 @@ inline V finishBlock(const RowPointers& r, int x, V thr, V c, V p0, V p8, uint8_
                             VecOps::vmax(VecOps::subs(p4, c), VecOps::subs(p12, c)));
   const V dq = VecOps::vmin(VecOps::vmax(VecOps::subs(c, p0), VecOps::subs(c, p8)),
                             VecOps::vmax(VecOps::subs(c, p4), VecOps::subs(c, p12)));
-  if (!VecOps::anyNonZero(VecOps::subs(VecOps::vmax(bq, dq), thr))) {
+  // A polarity whose quarter test fails in every lane has no corner in the block: its arc value
+  // stays <= b in every lane and cannot be a corner's score, so it is not computed.
+  const bool brightAny = VecOps::anyNonZero(VecOps::subs(bq, thr));
+  const bool darkAny = VecOps::anyNonZero(VecOps::subs(dq, thr));
+  if (!brightAny && !darkAny) {
     VecOps::store(score + x, VecOps::splat(0));
     return VecOps::splat(0);
   }
@@ -156,12 +164,17 @@ inline V finishBlock(const RowPointers& r, int x, V thr, V c, V p0, V p8, uint8_
                    VecOps::load(r.rp2 + x - 2),
                    VecOps::load(r.rp3 + x - 1)};
   V m[16];
+  V best = VecOps::splat(0);
+  if (brightAny) {
 #pragma GCC unroll 16
-  for (int k = 0; k < 16; ++k) m[k] = VecOps::subs(p[k], c);
-  const V bright = maxArcMin(m);
+    for (int k = 0; k < 16; ++k) m[k] = VecOps::subs(p[k], c);
+    best = maxArcMin(m);
+  }
+  if (darkAny) {
 #pragma GCC unroll 16
-  for (int k = 0; k < 16; ++k) m[k] = VecOps::subs(c, p[k]);
-  const V best = VecOps::vmax(bright, maxArcMin(m));
+    for (int k = 0; k < 16; ++k) m[k] = VecOps::subs(c, p[k]);
+    best = VecOps::vmax(best, maxArcMin(m));
+  }
   // Corner lanes keep best (= score + 1 >= b + 1), the others become 0.
   const V kept = VecOps::keepGreater(best, thr);
   VecOps::store(score + x, kept);

@@ -72,6 +72,12 @@ unset(ENV{PKG_CONFIG_PATH})
 # x86-64.
 set(ORZAVS_GTEST_FROM_SOURCE ON CACHE BOOL "Build GoogleTest from /usr/src/googletest (cross builds)")
 
+# Debian's armhf JVM, unpacked by scripts/armhf-sysroot.sh with its launcher <sysroot>/java (the
+# JVM under qemu-arm): the Java tests, the tools and the soak run on it, against the ARM library.
+if(EXISTS "${ORZAVS_ARMHF_SYSROOT}/java")
+  set(ORZAVS_TARGET_JAVA "${ORZAVS_ARMHF_SYSROOT}/java")
+endif()
+
 # CTest runs the ARM test programs through qemu-arm, with the cross runtime as the dynamic
 # loader's root and the sysroot's libjpeg on the library path.
 find_program(ORZAVS_QEMU_ARM qemu-arm)

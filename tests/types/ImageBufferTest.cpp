@@ -105,7 +105,7 @@ TEST(ImageBufferTest, TwoPlaneFillPlacesTheSecondAfterTheFirstWithinTheBlock) {
   ImageBuffer buffer;
   ASSERT_EQ(150, buffer.allocateBuffer(150));
   const std::vector<uint8_t> luma = pattern(200, 0);
-  const std::vector<uint8_t> chroma = pattern(100, 100);
+  const std::vector<uint8_t> chroma = pattern(200, 100);
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), 100, chroma.data(), 100));
   std::vector<uint8_t> expected(luma.begin(), luma.begin() + 100);
   expected.insert(expected.end(), chroma.begin(), chroma.begin() + 50);

@@ -5,15 +5,23 @@ import com.orza.vs.tools.server.Catalog;
 import com.orza.vs.tools.server.Recognizer;
 import java.awt.image.BufferedImage;
 import java.io.IOException;
+import java.util.ArrayDeque;
 import java.util.List;
 import java.util.Random;
+import java.util.concurrent.ExecutionException;
+import java.util.concurrent.ExecutorService;
+import java.util.concurrent.Executors;
+import java.util.concurrent.Future;
 
 /**
  * The built-in scene: the built-in catalogue's products (photographs) held in turn in front of
  * a hand-held camera over a table. Each product gets an equal share of the frames; within it
  * the camera pans slowly, looks at the product at a changing slant (a true perspective view),
  * shakes a little, and its motion blur comes and goes from frame to frame, with sensor noise
- * and a slowly drifting exposure. Every frame carries its truth: the product and its corners.
+ * and a slowly drifting exposure. Now and then the camera catches a lamp: veiling glare washes
+ * the frame out for a fraction of a second, fading in over two frames to a few frames of plain
+ * white and out again. Every frame carries its truth: the product and its corners (the product
+ * is still there when glare hides it).
  *
  * <p>Everything is drawn from a fixed seed, so a scene of a given size and length is the same
  * on every run.
@@ -28,7 +36,17 @@ public final class GeneratedSource implements FrameSource {
   /** Per-frame blur length in pixels and direction, drawn once. */
   private final double[] blur;
   private final double[] blurAngle;
+  /** Per-frame glare: a light level added to every pixel (0 = none, 300 = washed out to white). */
+  private final double[] glare;
   private int next;
+  /** Frames being drawn ahead of {@link #next}, in order. */
+  private static final int AHEAD = 4;
+  private final ArrayDeque<Future<Frame>> ahead = new ArrayDeque<>();
+  private final ExecutorService drawer = Executors.newSingleThreadExecutor(r -> {
+    Thread t = new Thread(r, "vsscan-scene");
+    t.setDaemon(true);
+    return t;
+  });
   /** Sensor noise: normally distributed values of standard deviation 3, drawn once. */
   private static final double[] NOISE = new double[65521];
 
@@ -57,6 +75,19 @@ public final class GeneratedSource implements FrameSource {
       blur[i] = u < 0.25 ? 6 + 10 * rnd.nextDouble() : 1 + 2.5 * rnd.nextDouble();
       angle += 0.5 * (rnd.nextDouble() - 0.5);
       blurAngle[i] = angle;
+    }
+    // Glare episodes of 5 to 9 frames, about one every 2.5 s: two frames fading in, plain white,
+    // two frames fading out.
+    glare = new double[frames];
+    Random lamp = new Random(31L);
+    for (int i = 0; i < frames; i++) {
+      if (lamp.nextDouble() >= 1 / (2.5 * fps)) continue;
+      int len = 5 + lamp.nextInt(5);
+      for (int j = 0; j < len && i + j < frames; j++) {
+        int edge = Math.min(j, len - 1 - j);
+        glare[i + j] = edge == 0 ? 60 : edge == 1 ? 130 : 300;
+      }
+      i += len;
     }
   }
 
@@ -133,17 +164,40 @@ public final class GeneratedSource implements FrameSource {
     return new Truth(p.id, Recognizer.project(homography(i), new double[] {0, 0, w, 0, w, h, 0, h}));
   }
 
+  /**
+   * The next frame. Frames are drawn a few ahead on a background thread, as a camera exposes
+   * the next frame while the app handles the last one: a scan then feeds in real time.
+   */
   @Override
-  public Frame next() {
+  public Frame next() throws IOException {
     if (next >= frames) return null;
-    int i = next++;
-    BufferedImage img = render(i);
-    Frame f = Yuv.toNv21(img, i);
+    while (ahead.size() < AHEAD && next + ahead.size() < frames) {
+      int i = next + ahead.size();
+      ahead.add(drawer.submit(() -> draw(i)));
+    }
+    next++;
+    try {
+      return ahead.remove().get();
+    } catch (InterruptedException e) {
+      Thread.currentThread().interrupt();
+      throw new IOException("interrupted while drawing a frame");
+    } catch (ExecutionException e) {
+      throw new IOException("cannot draw a frame: " + e.getCause(), e.getCause());
+    }
+  }
+
+  Frame draw(int i) {
+    Frame f = Yuv.toNv21(render(i), i);
     f.truth = truth(i);
     return f;
   }
 
-  /** Draws frame {@code i}: table and product, then motion blur, exposure and noise. */
+  @Override
+  public void close() {
+    drawer.shutdownNow();
+  }
+
+  /** Draws frame {@code i}: table and product, then motion blur, exposure, glare and noise. */
   BufferedImage render(int i) {
     Catalog.Product p = productAt(i);
     double[] inv = invert(homography(i));
@@ -178,7 +232,8 @@ public final class GeneratedSource implements FrameSource {
       int c = out[k];
       walk = (walk + 7919) % NOISE.length;
       double n = NOISE[walk];
-      int r = clamp(((c >> 16) & 255) * gain + n), g = clamp(((c >> 8) & 255) * gain + n), b = clamp((c & 255) * gain + n);
+      double lit = n + glare[i];
+      int r = clamp(((c >> 16) & 255) * gain + lit), g = clamp(((c >> 8) & 255) * gain + lit), b = clamp((c & 255) * gain + lit);
       out[k] = (r << 16) | (g << 8) | b;
     }
     BufferedImage img = new BufferedImage(width, height, BufferedImage.TYPE_INT_RGB);

@@ -20,18 +20,18 @@ public final class Measurements {
     public final String file;
     /** The engine's sharpness measure of the frame's luminance (the take rule's). */
     public final int sharpness;
-    /** The frame as JPEG, kept for the direct query; dropped once asked. */
-    byte[] jpeg;
+    /** The frame, kept for the direct query; dropped once asked. */
+    Frame frame;
     /** Product the server named when asked directly (null: none), and whether it was asked. */
     public String direct;
     public boolean asked;
 
-    FrameInfo(int index, Truth truth, String file, int sharpness, byte[] jpeg) {
+    FrameInfo(int index, Truth truth, String file, int sharpness, Frame frame) {
       this.index = index;
       this.truth = truth;
       this.file = file;
       this.sharpness = sharpness;
-      this.jpeg = jpeg;
+      this.frame = frame;
     }
 
     boolean directRight() {

@@ -19,6 +19,9 @@ import java.util.List;
 import java.util.LinkedHashMap;
 import java.util.Locale;
 import java.util.Map;
+import java.util.concurrent.ExecutorService;
+import java.util.concurrent.Executors;
+import java.util.concurrent.TimeUnit;
 import javax.imageio.IIOImage;
 import javax.imageio.ImageIO;
 import javax.imageio.ImageWriteParam;
@@ -43,6 +46,8 @@ public final class VsScan {
     int repeat = 1;
     boolean pace = true;
     String server;
+    /** Extra time the built-in server takes to answer the engine: a phone network's round trip. */
+    int latencyMs = 200;
     int connectTimeoutMs = 3000;
     int readTimeoutMs = 10000;
     File out = new File("scan-report");
@@ -67,11 +72,13 @@ public final class VsScan {
         "",
         "options",
         "  --size WxH          frame size of a raw stream, or of the built-in scene (default 640x480)",
-        "  --frames N          frames of the built-in scene (default 250), or at most N frames of SOURCE",
+        "  --frames N          frames of the built-in scene (default 360), or at most N frames of SOURCE",
         "  --fps F             time stamps at F frames per second (default: the video's, 30, or 5 for images)",
         "  --repeat N          feed each image N times",
         "  --no-pace           feed frames as fast as possible instead of in real time",
         "  --server URL        send requests to URL instead of the built-in reference server",
+        "  --latency MS        the built-in server answers MS later, as over a phone network (default 200;",
+        "                      0: loopback speed, the engine then rarely holds a frame while it waits)",
         "  --connect-timeout MS, --read-timeout MS   transport timeouts (default 3000, 10000)",
         "  --orientation DEG   screen orientation sent with every frame (default 0)",
         "  --out DIR           report folder (default ./scan-report)",
@@ -96,6 +103,7 @@ public final class VsScan {
         case "--repeat": o.repeat = (int) number(args, ++i, a, 1, 10_000); break;
         case "--no-pace": o.pace = false; break;
         case "--server": o.server = value(args, ++i, a); break;
+        case "--latency": o.latencyMs = (int) number(args, ++i, a, 0, 60_000); break;
         case "--connect-timeout": o.connectTimeoutMs = (int) number(args, ++i, a, 1, 600_000); break;
         case "--read-timeout": o.readTimeoutMs = (int) number(args, ++i, a, 1, 600_000); break;
         case "--orientation": o.orientation = (int) number(args, ++i, a, -360, 360); break;
@@ -184,7 +192,7 @@ public final class VsScan {
   private FrameSource openSource() throws IOException {
     if (o.input == null) {
       int[] size = o.size != null ? o.size : new int[] {640, 480};
-      return new GeneratedSource(size[0] & ~1, size[1] & ~1, o.frames > 0 ? o.frames : 250, o.fps > 0 ? o.fps : 30);
+      return new GeneratedSource(size[0] & ~1, size[1] & ~1, o.frames > 0 ? o.frames : 360, o.fps > 0 ? o.fps : 30);
     }
     return FileSources.open(new File(o.input), o.size, o.fps, o.repeat);
   }
@@ -202,6 +210,7 @@ public final class VsScan {
     try (FrameSource source = openSource()) {
       if (url == null) {
         ReferenceServer.Options so = new ReferenceServer.Options();
+        so.delayMs = o.latencyMs;
         so.log = line -> {
           serverLog.add(line);
           if (o.verbose) progress.println(line);
@@ -241,7 +250,7 @@ public final class VsScan {
           engine.feed(f, t, o.orientation);
           if (f.truth != null || f.file != null) {
             truthFrames.add(new Measurements.FrameInfo(f.index, f.truth, f.file, Measurements.sharpness(f),
-                f.truth != null ? jpeg(f) : null));
+                f.truth != null ? f : null));
           }
           n++;
           if (source.stills()) engine.awaitOutcomes(o.connectTimeoutMs + o.readTimeoutMs + 2000L);
@@ -298,11 +307,12 @@ public final class VsScan {
   }
 
   /**
-   * Sends every frame that has a truth to the server directly, outside the engine, one after
-   * the other, and notes the product each reply names: what choosing frames at random would get.
+   * Sends every frame that has a truth to the server directly, outside the engine, and notes
+   * the product each reply names: what choosing frames at random would get. Four requests are
+   * in flight at a time, so the server's latency does not make this phase four times longer.
    */
-  private void askEveryFrame(String url, List<Measurements.FrameInfo> frames) {
-    if (frames.isEmpty() || frames.get(0).jpeg == null) return;
+  private void askEveryFrame(String url, List<Measurements.FrameInfo> frames) throws InterruptedException {
+    if (frames.isEmpty() || frames.get(0).frame == null) return;
     if (!o.quiet) progress.println("vsscan: asking the server about each of the " + frames.size() + " frames directly");
     VisualSearchHttpClient client;
     try {
@@ -312,19 +322,32 @@ public final class VsScan {
     }
     Map<String, String> params = Collections.singletonMap("vsearch_params_json",
         "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}");
+    ExecutorService pool = Executors.newFixedThreadPool(4);
     try {
       for (Measurements.FrameInfo f : frames) {
-        VisualSearchHttpClient.Exchange x = client.post("vsscan-direct-" + f.index, params, new LinkedHashMap<>(), f.jpeg);
-        f.jpeg = null;
-        if (x.code != 200) continue;
-        try {
-          f.direct = Measurements.productInReply(x.body);
-          f.asked = true;
-        } catch (IllegalArgumentException e) {
-          // not JSON: the frame stays unasked
-        }
+        pool.execute(() -> {
+          byte[] jpeg;
+          try {
+            jpeg = jpeg(f.frame);
+          } catch (IOException e) {
+            return; // the frame stays unasked
+          } finally {
+            f.frame = null;
+          }
+          VisualSearchHttpClient.Exchange x = client.post("vsscan-direct-" + f.index, params, new LinkedHashMap<>(), jpeg);
+          if (x.code != 200) return;
+          try {
+            f.direct = Measurements.productInReply(x.body);
+            f.asked = true;
+          } catch (IllegalArgumentException e) {
+            // not JSON: the frame stays unasked
+          }
+        });
       }
     } finally {
+      pool.shutdown();
+      // Every request ends within its timeouts; the wait covers them all with room to spare.
+      pool.awaitTermination((long) frames.size() * (o.connectTimeoutMs + o.readTimeoutMs) + 10_000L, TimeUnit.MILLISECONDS);
       client.close();
     }
   }

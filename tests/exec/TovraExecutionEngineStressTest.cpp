@@ -18,10 +18,8 @@ using Tovra::TovraExecutionEngine;
 TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
   constexpr int kProducers = 4;
   constexpr int kJobsEach = 300;
-  std::vector<std::unique_ptr<TestJob>> jobs;
-  for (int i = 0; i < kProducers * kJobsEach; ++i) jobs.emplace_back(new TestJob(i));
-  std::atomic<int> concurrentRuns{0};
-  std::atomic<int> maxConcurrent{0};
+  std::vector<std::unique_ptr<TestJob>> jobs = orzavs_test::makeJobs(0, kProducers * kJobsEach - 1);
+  std::atomic<int> concurrentRuns{0}, maxConcurrent{0};
   for (auto& job : jobs) {
     job->work = [&](TestJob&) {
       const int now = concurrentRuns.fetch_add(1) + 1;
@@ -59,8 +57,7 @@ TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
     toggler.join();
   }  // destruction drains and joins
 
-  int ran = 0;
-  int settledUnrun = 0;
+  int ran = 0, settledUnrun = 0;
   for (auto& job : jobs) {
     ASSERT_LE(job->runs(), 1);
     if (job->state() == Tovra::Idle) {
@@ -82,8 +79,7 @@ TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
 // every start/stop: destruction must always return with every accepted job settled.
 TEST(TovraExecutionEngineStressTest, RepeatedCreateAndDestroyWithQueuedJobs) {
   for (int round = 0; round < 50; ++round) {
-    std::vector<std::unique_ptr<TestJob>> jobs;
-    for (int i = 0; i < 8; ++i) jobs.emplace_back(new TestJob(i));
+    std::vector<std::unique_ptr<TestJob>> jobs = orzavs_test::makeJobs(0, 7);
     {
       TovraExecutionEngine engine(1);
       for (auto& job : jobs) engine.addJob(job.get());

@@ -11,6 +11,7 @@
 #include "support/TestJob.h"
 
 using orzavs_test::Gate;
+using orzavs_test::makeJobs;
 using orzavs_test::RunLog;
 using orzavs_test::StdoutCapture;
 using orzavs_test::TestJob;
@@ -18,33 +19,28 @@ using Tovra::TovraExecutionEngine;
 
 namespace {
 
-// With one worker the queue is strictly FIFO: once `marker` has finished, every job added
-// before it has been fully settled.
-void drain(TovraExecutionEngine& engine) {
-  TestJob marker(-1);
-  engine.addJob(&marker);
-  ASSERT_TRUE(marker.waitForState(Tovra::Finished));
-}
-
-std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, RunLog* log = nullptr) {
-  std::vector<std::unique_ptr<TestJob>> jobs;
-  for (int i = from; i <= to; ++i) jobs.emplace_back(new TestJob(i, log));
-  return jobs;
+// Makes `job` open `started` when it runs, then hold its worker until `release` opens.
+void blockOnRun(TestJob& job, Gate& started, Gate& release) {
+  job.work = [&](TestJob&) {
+    started.open();
+    release.wait();
+  };
 }
 
 }  // namespace
 
-TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedIncludingJobsAddedByJobs) {
+TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButAwaitingOnes) {
   RunLog log;
   Gate gate;
   std::vector<std::unique_ptr<TestJob>> jobs = makeJobs(0, 19, &log);
   TestJob added(20, &log);
   // The first job holds the worker until all others are queued, so they really wait in line.
   jobs[0]->work = [&](TestJob&) { gate.wait(); };
+  jobs[5]->endAwaitingReply = true;
   {
     StdoutCapture out;
     TovraExecutionEngine engine(1);
-    jobs[19]->work = [&](TestJob&) { engine.addJob(&added); };
+    jobs[19]->work = [&](TestJob&) { engine.addJob(&added); };  // a job adding a job
     engine.addJob(nullptr);  // ignored silently
     for (auto& job : jobs) engine.addJob(job.get());
     EXPECT_EQ(Tovra::Queued, jobs[1]->state());
@@ -55,7 +51,12 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedIncludingJobsAdde
   std::vector<int> expected(21);
   for (int i = 0; i < 21; ++i) expected[i] = i;
   EXPECT_EQ(expected, log.ids());
-  for (auto& job : jobs) EXPECT_EQ(Tovra::Finished, job->state());
+  for (auto& job : jobs) {
+    EXPECT_EQ(job == jobs[5] ? Tovra::AwaitingReply : Tovra::Finished, job->state());
+    EXPECT_EQ(1, job->runs());
+  }
+  for (int32_t busy : {Tovra::Queued, Tovra::Running, Tovra::AwaitingReply}) EXPECT_TRUE(Tovra::isBusyState(busy));
+  for (int32_t idle : {Tovra::Idle, Tovra::Finished}) EXPECT_FALSE(Tovra::isBusyState(idle));
 }
 
 TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
@@ -74,10 +75,7 @@ TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
 TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResumed) {
   Gate started, release;
   TestJob blocker(0);
-  blocker.work = [&](TestJob&) {
-    started.open();
-    release.wait();
-  };
+  blockOnRun(blocker, started, release);
   std::vector<std::unique_ptr<TestJob>> waiting = makeJobs(1, 3);
   TovraExecutionEngine engine(1);
   engine.addJob(&blocker);
@@ -114,25 +112,10 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   EXPECT_EQ(0, racing.runs());
 }
 
-TEST(TovraExecutionEngineTest, AwaitingReplySurvivesSettling) {
-  TovraExecutionEngine engine(1);
-  TestJob job(1);
-  job.endAwaitingReply = true;
-  engine.addJob(&job);
-  drain(engine);
-  EXPECT_EQ(1, job.runs());
-  EXPECT_EQ(Tovra::AwaitingReply, job.state());
-  for (int32_t busy : {Tovra::Queued, Tovra::Running, Tovra::AwaitingReply}) EXPECT_TRUE(Tovra::isBusyState(busy));
-  for (int32_t idle : {Tovra::Idle, Tovra::Finished}) EXPECT_FALSE(Tovra::isBusyState(idle));
-}
-
 TEST(TovraExecutionEngineTest, DestructionSettlesQueuedJobsAndJoins) {
   Gate started, release;
   TestJob running(0);
-  running.work = [&](TestJob&) {
-    started.open();
-    release.wait();
-  };
+  blockOnRun(running, started, release);
   std::vector<std::unique_ptr<TestJob>> queued = makeJobs(1, 4);
   auto engine = std::make_unique<TovraExecutionEngine>(1);
   engine->addJob(&running);

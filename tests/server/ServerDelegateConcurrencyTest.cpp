@@ -8,13 +8,13 @@
 #include <vector>
 
 #include "server/ServerDelegate.h"
-#include "support/RecordingTransport.h"
+#include "support/Fakes.h"
 #include "support/TestJob.h"
 
 using orzavs_test::makeRequest;
 using orzavs_test::makeResponse;
 using orzavs_test::RecordingHandler;
-using orzavs_test::RecordingTransport;
+using orzavs_test::FakeTransport;
 using Tovra::Server::ServerResponse;
 
 namespace {
@@ -38,7 +38,7 @@ class CountingHandler : public Tovra::Server::ServerResponseHandler {
 // once, however the pushes interleave.
 TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
   constexpr size_t kIds = 400;
-  RecordingTransport transport;
+  FakeTransport transport;
   CountingHandler handler(kIds);
   for (size_t i = 0; i < kIds; ++i) transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
   std::vector<std::thread> pushers;
@@ -59,7 +59,7 @@ TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
 // relaxed counters, which order nothing: only the delegate's own lock may order its table.
 TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
   constexpr size_t kIds = 600;
-  RecordingTransport transport;
+  FakeTransport transport;
   CountingHandler handler(kIds);
   std::atomic<size_t> sent{0}, pushed{0};
   std::thread sender([&] {
@@ -86,7 +86,7 @@ TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
 // forgetHandler must not return while a delivery to that handler is still running on another
 // thread: only then may the handler be destroyed.
 TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
-  RecordingTransport transport;
+  FakeTransport transport;
   orzavs_test::Gate entered, release;
   std::atomic<bool> deliveryDone{false}, forgotten{false};
   RecordingHandler handler;
@@ -115,7 +115,7 @@ TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
 // The pattern a job uses on destruction: forget the handler, then free it, while a late reply
 // for it is being pushed on another thread. ASan/TSan catch a delivery into freed memory.
 TEST(ServerDelegateConcurrencyTest, HandlerDestroyedAfterForgetWhileRepliesRace) {
-  RecordingTransport transport;
+  FakeTransport transport;
   for (int round = 0; round < 300; ++round) {
     auto handler = std::make_unique<RecordingHandler>();
     std::atomic<int> touched{0};

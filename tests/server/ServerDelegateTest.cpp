@@ -5,12 +5,12 @@
 #include <stdexcept>
 #include <thread>
 
-#include "support/RecordingTransport.h"
+#include "support/Fakes.h"
 
 using orzavs_test::makeRequest;
 using orzavs_test::makeResponse;
 using orzavs_test::RecordingHandler;
-using orzavs_test::RecordingTransport;
+using orzavs_test::FakeTransport;
 using Tovra::Server::ServerRequest;
 using Tovra::Server::ServerResponse;
 
@@ -35,7 +35,7 @@ TEST(ServerRecordsTest, DefaultsConstructionAndClear) {
 }
 
 TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {
-  RecordingTransport transport;
+  FakeTransport transport;
   RecordingHandler first, second;
   EXPECT_TRUE(transport.sendServerRequest(makeRequest("dup", &first)));
   transport.sendServerRequest(makeRequest("dup", &second));
@@ -67,7 +67,7 @@ TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {
 }
 
 TEST(ServerDelegateTest, ReplyArrivingDuringTheTransferIsRouted) {
-  RecordingTransport transport;
+  FakeTransport transport;
   RecordingHandler handler;
   transport.onSend = [&](const ServerRequest& request) {
     const std::string id = request.id;
@@ -80,7 +80,7 @@ TEST(ServerDelegateTest, ReplyArrivingDuringTheTransferIsRouted) {
 }
 
 TEST(ServerDelegateTest, ForgetDropsOnlyThatHandlerAndWorksFromItsOwnCallback) {
-  RecordingTransport transport;
+  FakeTransport transport;
   RecordingHandler gone, kept;
   transport.sendServerRequest(makeRequest("a", &gone));
   transport.sendServerRequest(makeRequest("b", &kept));

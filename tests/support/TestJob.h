@@ -4,9 +4,10 @@
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
-#include <cstdint>
 #include <functional>
+#include <memory>
 #include <mutex>
+#include <thread>
 #include <vector>
 
 #include "exec/Job.h"
@@ -16,8 +17,14 @@ namespace orzavs_test {
 // Records, in order, the ids of the jobs that ran. Safe from any thread.
 class RunLog {
  public:
-  void add(int id);
-  std::vector<int> ids() const;
+  void add(int id) {
+    std::lock_guard<std::mutex> lock(mutex_);
+    ids_.push_back(id);
+  }
+  std::vector<int> ids() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return ids_;
+  }
 
  private:
   mutable std::mutex mutex_;
@@ -27,9 +34,21 @@ class RunLog {
 // A one-shot gate: wait() blocks until open() (or until the timeout; returns whether it opened).
 class Gate {
  public:
-  void open();
-  bool wait(std::chrono::milliseconds timeout = std::chrono::seconds(10));
-  bool isOpen() const;
+  void open() {
+    {
+      std::lock_guard<std::mutex> lock(mutex_);
+      open_ = true;
+    }
+    cv_.notify_all();
+  }
+  bool wait(std::chrono::milliseconds timeout = std::chrono::seconds(10)) {
+    std::unique_lock<std::mutex> lock(mutex_);
+    return cv_.wait_for(lock, timeout, [this] { return open_; });
+  }
+  bool isOpen() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return open_;
+  }
 
  private:
   mutable std::mutex mutex_;
@@ -41,16 +60,33 @@ class Gate {
 // optionally does some work (which may block, add jobs, or end AwaitingReply).
 class TestJob : public Tovra::Job {
  public:
-  explicit TestJob(int id = 0, RunLog* log = nullptr);
+  explicit TestJob(int id = 0, RunLog* log = nullptr) : id_(id), log_(log) {}
 
-  void markQueued() override;
-  void run() override;
-  void finishUnlessAwaiting() override;
+  void markQueued() override {
+    state_.store(Tovra::Queued);
+    if (onMarkQueued) onMarkQueued(*this);
+  }
+  void run() override {
+    state_.store(Tovra::Running);
+    runs_.fetch_add(1);
+    if (log_ != nullptr) log_->add(id_);
+    if (work) work(*this);
+    if (endAwaitingReply) state_.store(Tovra::AwaitingReply);
+  }
+  void finishUnlessAwaiting() override {
+    if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
+  }
 
   // Polls every millisecond until the state is `wanted`; false after the timeout.
-  bool waitForState(int32_t wanted, std::chrono::milliseconds timeout = std::chrono::seconds(10));
+  bool waitForState(int32_t wanted, std::chrono::milliseconds timeout = std::chrono::seconds(10)) {
+    const auto deadline = std::chrono::steady_clock::now() + timeout;
+    while (state_.load() != wanted) {
+      if (std::chrono::steady_clock::now() >= deadline) return false;
+      std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    return true;
+  }
 
-  int id() const { return id_; }
   int32_t state() const { return state_.load(); }
   int runs() const { return runs_.load(); }
 
@@ -67,6 +103,13 @@ class TestJob : public Tovra::Job {
   std::atomic<int32_t> state_{Tovra::Idle};
   std::atomic<int> runs_{0};
 };
+
+// Jobs numbered from..to (inclusive), logging into `log`.
+inline std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, RunLog* log = nullptr) {
+  std::vector<std::unique_ptr<TestJob>> jobs;
+  for (int i = from; i <= to; ++i) jobs.emplace_back(new TestJob(i, log));
+  return jobs;
+}
 
 }  // namespace orzavs_test
 

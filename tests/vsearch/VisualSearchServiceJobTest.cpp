@@ -6,8 +6,7 @@
 
 #include <gtest/gtest.h>
 
-#include "support/EngineFakes.h"
-#include "support/RecordingTransport.h"
+#include "support/Fakes.h"
 #include "support/StdoutCapture.h"
 #include "vsearch/JpegEncoder.h"
 #include "vsearch/JpegTestSupport.h"

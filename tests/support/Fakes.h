@@ -1,19 +1,22 @@
-#ifndef ORZAVS_TESTS_SUPPORT_ENGINEFAKES_H
-#define ORZAVS_TESTS_SUPPORT_ENGINEFAKES_H
+#ifndef ORZAVS_TESTS_SUPPORT_FAKES_H
+#define ORZAVS_TESTS_SUPPORT_FAKES_H
 
 // Test doubles for driving the engine as a client would: an event delegate that records its
-// callbacks, a transport that records requests and answers from its own thread, frames.
+// callbacks, a transport that records requests and answers from its own thread, a response
+// handler that records what it gets, frames, and an engine wired to all of them.
 
 #include <chrono>
 #include <condition_variable>
 #include <cstdint>
 #include <deque>
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <string>
 #include <thread>
 #include <vector>
 
+#include "engine/TovraStateEngine.h"
 #include "server/ServerDelegate.h"
 #include "types/EventDelegateBase.h"
 #include "types/ImageFormat.h"
@@ -86,7 +89,7 @@ struct SentRequest {
 };
 
 // Records requests; with a responder, answers each from its own thread after the chosen delay
-// (or never, when the responder returns false).
+// (or never, when the responder returns false). sendServerRequestImpl returns `result`.
 class FakeTransport : public Tovra::Server::ServerDelegate {
  public:
   using Responder = std::function<bool(const SentRequest&, Tovra::Server::ServerResponse&, Ms& delay)>;
@@ -127,8 +130,9 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     }
     wake_.notify_all();
     if (onSend) onSend(request);
-    return true;
+    return result;
   }
+  bool result = true;
 
   void pushLater(const Tovra::Server::ServerResponse& reply, Ms delay = Ms(0)) {
     locked([&] { queue_.push_back({reply, Clock::now() + delay}); });
@@ -222,6 +226,73 @@ inline std::vector<uint8_t> makeFrame(int width, int height, int stride, int for
   }
   return bytes;
 }
+
+// A response handler that keeps copies of the responses it receives, then runs `onResponse`.
+class RecordingHandler : public Tovra::Server::ServerResponseHandler {
+ public:
+  void handleServerResponse(const Tovra::Server::ServerResponse& response) override {
+    {
+      std::lock_guard<std::mutex> lock(mutex_);
+      responses_.push_back(response);
+    }
+    if (onResponse) onResponse(response);
+  }
+  std::vector<Tovra::Server::ServerResponse> responses() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return responses_;
+  }
+  size_t count() const { return responses().size(); }
+  std::function<void(const Tovra::Server::ServerResponse&)> onResponse;
+
+ private:
+  mutable std::mutex mutex_;
+  std::vector<Tovra::Server::ServerResponse> responses_;
+};
+
+inline Tovra::Server::ServerRequest makeRequest(const std::string& id, Tovra::Server::ServerResponseHandler* handler) {
+  Tovra::Server::ServerRequest request;
+  request.id = id;
+  request.responseHandler = handler;
+  return request;
+}
+
+inline Tovra::Server::ServerResponse makeResponse(const std::string& id, const std::string& body = "",
+                                                  int32_t code = 200, double roundtripTime = -1.0) {
+  Tovra::Server::ServerResponse response;
+  response.id = id;
+  response.responseStr = body;
+  response.responseCode = code;
+  response.roundtripTime = roundtripTime;
+  return response;
+}
+
+// A started engine wired to a recording delegate and transport, fed 64x48 frames of `format`:
+// textured, or uniform with `flat`.
+struct EngineRig {
+  explicit EngineRig(OrzaVSMobile::ImageFormat frameFormat = OrzaVSMobile::NV21)
+      : format(frameFormat), textured(makeFrame(64, 48, 64, format)), flat(makeFrame(64, 48, 64, format, true)),
+        engine(new Tovra::TovraStateEngine) {
+    engine->setEventDelegate(&events);
+    engine->addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
+    engine->startEngine();
+  }
+  OrzaVSMobile::ImageBuffer image(bool isFlat = false) {
+    return OrzaVSMobile::ImageBuffer(0, format, 64, 48, 64, 1, (isFlat ? flat : textured).data());
+  }
+  void frame(double t, bool isFlat = false) {
+    OrzaVSMobile::ImageBuffer pixels = image(isFlat);
+    OrzaVSMobile::ExtraFrameData extra;
+    extra.timeStamp = t;
+    engine->process("", pixels, extra);
+  }
+  bool jobIdle() { return waitFor([&] { return !engine->job(0).isBusy(); }); }
+
+  RecordingEvents events;
+  FakeTransport transport;
+  const OrzaVSMobile::ImageFormat format;
+  std::vector<uint8_t> textured, flat;
+  std::unique_ptr<Tovra::TovraStateEngine> engine;  // last: destroyed before its delegates
+};
 
 }  // namespace orzavs_test
 

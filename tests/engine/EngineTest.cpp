@@ -1,0 +1,336 @@
+// The engine as a client drives it: the state table, the delegates, the take rule, held and lent
+// frames, refused frames and single images.
+
+#include "engine/TovraStateEngine.h"
+#include "engine/TovraStateEngineFacade.h"
+
+#include <map>
+#include <regex>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "support/Fakes.h"
+#include "support/GuardedBytes.h"
+#include "support/StdoutCapture.h"
+
+namespace {
+
+using orzavs_test::waitFor;
+using OrzaVSMobile::ExtraFrameData;
+using OrzaVSMobile::ImageBuffer;
+using Tovra::TovraStateEngine;
+
+constexpr int kW = 64;
+constexpr int kH = 48;
+
+ImageBuffer lendable(OrzaVSMobile::ImageFormat format) { return ImageBuffer(0, format, kW, kH, kW, 1, nullptr); }
+
+std::string frameIdOf(const std::string& requestId) { return requestId.substr(requestId.rfind('-') + 1); }
+
+// A started engine on NV21 frames whose transport answers nothing unless told to.
+class EngineTest : public ::testing::Test, public orzavs_test::EngineRig {};
+
+TEST(EngineLifecycle, FollowsTheStateTable) {
+  using E = TovraStateEngine;
+  enum Executor { None, First, Fresh };
+  // Each operation, the state after it and the executor then: none, the first one or a new one.
+  const struct { void (E::*op)(); Tovra::EngineState state; Executor executor; } steps[] = {
+      {&E::pauseEngine, Tovra::STOPPED, None},  // pause, resume and stop are ignored while STOPPED
+      {&E::resumeEngine, Tovra::STOPPED, None},  {&E::stopEngine, Tovra::STOPPED, None},
+      {&E::startEngine, Tovra::RUNNING, First},  {&E::startEngine, Tovra::RUNNING, First},  // kept
+      {&E::resumeEngine, Tovra::RUNNING, First}, {&E::pauseEngine, Tovra::PAUSED, First},   // alive
+      {&E::pauseEngine, Tovra::PAUSED, First},   {&E::resumeEngine, Tovra::RUNNING, First},
+      {&E::pauseEngine, Tovra::PAUSED, First},   {&E::startEngine, Tovra::RUNNING, Fresh},  // restart
+      {&E::pauseEngine, Tovra::PAUSED, Fresh},   {&E::stopEngine, Tovra::STOPPED, None}};
+  TovraStateEngine engine;
+  ASSERT_EQ(engine.jobCount(), 1u);
+  const Tovra::TovraExecutionEngine* first = nullptr;
+  for (size_t i = 0; i < sizeof steps / sizeof steps[0]; ++i) {
+    (engine.*steps[i].op)();
+    if (first == nullptr && engine.executor() != nullptr) {
+      first = engine.executor();
+      EXPECT_EQ(first->threadCount(), 1u);
+    }
+    EXPECT_EQ(engine.getState(), steps[i].state) << "step " << i;
+    EXPECT_EQ(engine.executor() == nullptr, steps[i].executor == None) << "step " << i;
+    if (steps[i].executor != None) {
+      EXPECT_EQ(engine.executor() == first, steps[i].executor == First) << "step " << i;
+    }
+  }
+}
+
+TEST(EngineLifecycle, DelegatesAreStoredOnlyAsDefined) {
+  orzavs_test::RecordingEvents events;
+  orzavs_test::FakeTransport transport;
+  TovraStateEngine engine;
+  engine.setEventDelegate(&events);
+  engine.setEventDelegate(nullptr);  // a null never replaces a set delegate
+  EXPECT_EQ(engine.eventDelegate(), &events);
+  for (int id : {0, 2, 3, 4, 5, 6, 7, -1}) {
+    engine.addObjectModule(static_cast<Tovra::ObjectModuleID>(id), &transport);
+    EXPECT_EQ(engine.serverDelegate(), nullptr) << id;
+  }
+  engine.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
+  EXPECT_EQ(engine.serverDelegate(), &transport);
+  engine.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, nullptr);  // a null is stored
+  EXPECT_EQ(engine.serverDelegate(), nullptr);
+}
+
+TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
+  frame(1.0);  // sent, never answered: the job stays busy
+  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 1; }));
+  frame(2.0);  // held while the job awaits its reply
+  ImageBuffer lent = lendable(OrzaVSMobile::GRAY);
+  std::string key;
+  engine->requestImageBuffer(lent, key);
+  EXPECT_TRUE(engine->hasHeldRecord());
+  EXPECT_EQ(engine->pendingBufferCount(), 1u);
+
+  engine->pauseEngine();
+  EXPECT_FALSE(engine->hasHeldRecord());
+  EXPECT_EQ(engine->pendingBufferCount(), 0u);
+  EXPECT_EQ(engine->lastTakenTime(), -1.0);
+  EXPECT_EQ(engine->job(0).state(), Tovra::Finished);
+  // The lent buffer outlived the reset that dropped its record: a late fill is harmless.
+  EXPECT_EQ(lent.fillBuffer(textured.data(), kW * kH), kW * kH);
+
+  engine->resumeEngine();
+  frame(2.0);  // the same time stamp is taken again after the reset
+  EXPECT_EQ(engine->lastTakenTime(), 2.0);
+  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 2; }));
+}
+
+// Without an event delegate replies are still handled, silently; the operations this build does
+// not implement are accepted silently in every state.
+TEST(EngineFacade, ANullEventDelegateAndTheDoNothingOperationsAreSilentInEveryState) {
+  orzavs_test::FakeTransport transport;
+  transport.answerEverything();
+  Tovra::TovraStateEngineFacade facade(nullptr);
+  std::map<std::string, uint32_t> counts = {{"frames", 3}};
+  std::map<std::string, double> values = {{"fps", 29.5}};
+  const std::map<std::string, std::string> props = {{"k", "v"}};
+  std::vector<uint8_t> pixels = orzavs_test::makeFrame(kW, kH, kW, OrzaVSMobile::GRAY);
+  ImageBuffer image(0, OrzaVSMobile::GRAY, kW, kH, kW, 1, pixels.data());
+  ExtraFrameData extra;
+  orzavs_test::StdoutCapture printed;
+  for (int step = 0; step < 4; ++step) {
+    if (step == 1) {
+      facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport, "props are ignored");
+      facade.startEngine();
+      facade.processSingleImage(image, extra);
+      // The transport counts a reply once pushServerResponse has returned on its own thread,
+      // which can be just after processSingleImage saw the reply handled.
+      ASSERT_TRUE(waitFor([&] { return transport.pushedCount() == 1; }));
+      facade.process(image, extra);
+      ASSERT_TRUE(waitFor([&] { return transport.pushedCount() == 2; }));
+    }
+    if (step == 2) facade.pauseEngine();
+    if (step == 3) facade.stopEngine();
+    facade.readProps("{}");
+    facade.enableSingleImageMode();
+    facade.disableSingleImageMode();
+    facade.readObjectModuleProps(Tovra::VISUAL_SEARCH_SERVICE_MOD, "x");
+    facade.readObjectModuleProps(props);
+    facade.removeObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD);
+    facade.removeAllObjectModules();
+    facade.getAndClearMetrics(counts, values);
+    facade.enableEventLogging();
+    facade.saveEventLog("/nonexistent/path");
+    facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, props);
+    Tovra::CameraResRequirement requirement;
+    facade.getCameraResRequirement(requirement);
+    EXPECT_EQ(requirement.minHeight, 320);
+    EXPECT_EQ(requirement.maxHeight, 720);
+  }
+  EXPECT_EQ(printed.text(), "");
+  EXPECT_EQ(counts, (std::map<std::string, uint32_t>{{"frames", 3}}));
+  EXPECT_EQ(values, (std::map<std::string, double>{{"fps", 29.5}}));
+}
+
+TEST_F(EngineTest, TimeRuleComparesDoubleDifferencesStrictly) {
+  transport.answerEverything();
+  const struct { double last, next; bool taken; } cases[] = {
+      {0.0, 0.1, false}, {0.5, 0.6, false}, {1.0, 1.1, true}, {3.0, 3.0, false}};
+  for (const auto& c : cases) {
+    engine->pauseEngine();  // back to "nothing taken yet": the next frame is always taken
+    engine->resumeEngine();
+    frame(c.last);
+    ASSERT_TRUE(jobIdle());
+    const size_t sent = transport.sentCount();
+    frame(c.next);
+    EXPECT_EQ(engine->lastTakenTime(), c.taken ? c.next : c.last) << c.last << " -> " << c.next;
+    ASSERT_TRUE(jobIdle());
+    EXPECT_EQ(transport.sentCount(), sent + (c.taken ? 1 : 0));
+  }
+  EXPECT_EQ(events.pointCounts().size(), 8u);  // every accepted frame, taken or not
+  EXPECT_GT(events.pointCounts()[0], 0u);
+  EXPECT_LE(events.pointCounts()[0], 50u);
+}
+
+TEST_F(EngineTest, HeldFrameIsReplacedBySharpnessOrAgeAndSentWhenTheJobFrees) {
+  frame(0.0);  // frame 0: sent; the job awaits its reply
+  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 1; }));
+  frame(0.2, true);  // frame 1: held
+  frame(0.3, true);  // flat, 0.1 younger: not taken
+  frame(0.6, true);  // 0.4 older is not more than 0.4: not taken
+  EXPECT_EQ(engine->lastTakenTime(), 0.2);
+  frame(0.7, true);  // 0.5 older: replaces the held frame (frame 2)
+  frame(0.75);       // sharper than the held record's 0: replaces it (frame 3)
+  EXPECT_EQ(engine->lastTakenTime(), 0.75);
+  EXPECT_EQ(events.pointCounts().back(), events.pointCounts().front());
+  EXPECT_EQ(events.pointCounts()[1], 0u);  // a uniform frame has no corners
+  transport.pushServerResponse(orzavs_test::makeResponse(transport.sent()[0].id, orzavs_test::replyBody("Q0")));
+  ASSERT_TRUE(jobIdle());
+  frame(0.76, true);  // not taken itself, but dispatches the held frame
+  EXPECT_FALSE(engine->hasHeldRecord());
+  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 2; }));
+  EXPECT_EQ(frameIdOf(transport.sent()[0].id), "0");
+  EXPECT_EQ(frameIdOf(transport.sent()[1].id), "3");
+  EXPECT_EQ(transport.sent()[1].metadata.at("lastQueryId"), "Q0");
+}
+
+TEST(Sharpness, UsesCrossedMarginsConsecutiveRowsAndTheConstantBelowOneTenth) {
+  // width 15: top margin round(15 * k) = 1 (with 0.1 it would be 2); height 25: left margin 2
+  // (with 0.1, 3). Rows examined: 2..6 (counter 1, 6, 11, 16, 21 < 24); columns 2, 7, 12.
+  const int w = 15, h = 25;
+  std::vector<uint8_t> plane(static_cast<size_t>(w) * h);
+  ImageBuffer image(0, OrzaVSMobile::GRAY, w, h, w, 1, plane.data());
+  // One bright pixel at (x, y) and the sum it gives: a sample, a neighbour of samples, or neither.
+  const int cases[][3] = {{2, 2, 9}, {2, 3, 10}, {2, 6, 9}, {2, 7, 1}, {2, 8, 0}, {2, 1, 1}, {3, 2, 2}, {12, 4, 10}};
+  for (const auto& c : cases) {
+    std::fill(plane.begin(), plane.end(), 0);
+    plane[static_cast<size_t>(c[1]) * w + c[0]] = 255;
+    EXPECT_EQ(TovraStateEngine::sharpness(image), c[2] * 255) << c[0] << "," << c[1];
+  }
+  // Tiny planes, in guarded memory: samples without their whole neighbourhood are skipped.
+  for (const auto& size : {std::make_pair(1, 1), std::make_pair(4, 4), std::make_pair(15, 3), std::make_pair(2, 8)}) {
+    orzavs_test::GuardedBytes tiny(std::vector<uint8_t>(static_cast<size_t>(size.first) * size.second, 200));
+    ImageBuffer guarded(0, OrzaVSMobile::GRAY, size.first, size.second, size.first, 1, const_cast<uint8_t*>(tiny.data()));
+    EXPECT_EQ(TovraStateEngine::sharpness(guarded), 0);
+  }
+}
+
+TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
+  transport.answerEverything();
+  ImageBuffer lent = lendable(OrzaVSMobile::NV21);
+  std::string key;
+  engine->requestImageBuffer(lent, key);
+  ASSERT_EQ(lent.allocLen, kW * kH * 3 / 2);
+  EXPECT_TRUE(std::regex_match(key, std::regex("[0-9]+-0"))) << key;
+  ASSERT_EQ(lent.fillBuffer(textured.data(), static_cast<int32_t>(textured.size())), lent.allocLen);
+  ExtraFrameData extra;
+  extra.timeStamp = 0.0;
+  engine->process(key, lent, extra);
+  EXPECT_EQ(lent.data, nullptr);  // detached from the record it handed back
+  EXPECT_EQ(lent.allocLen, 0);
+  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 1; }));
+  EXPECT_EQ(frameIdOf(transport.sent()[0].id), "0");  // the lent record itself was sent
+  ASSERT_TRUE(jobIdle());
+
+  orzavs_test::StdoutCapture printed;
+  ImageBuffer plain = image();
+  engine->process("no-such-key", plain, extra);  // like an empty key: no line
+  std::vector<ImageBuffer> buffers(5, lendable(OrzaVSMobile::GRAY));
+  std::vector<std::string> keys(5);
+  for (int i = 0; i < 5; ++i) {
+    engine->requestImageBuffer(buffers[i], keys[i]);
+    ASSERT_NE(buffers[i].data, nullptr) << i;
+  }
+  ImageBuffer sixth = lendable(OrzaVSMobile::GRAY);
+  std::string sixthKey = "unchanged";
+  engine->requestImageBuffer(sixth, sixthKey);
+  EXPECT_EQ(sixthKey, "unchanged");
+  buffers[1].format = OrzaVSMobile::RGB;  // refused format
+  buffers[2].widthStep = kW - 1;          // refused stride
+  buffers[3].height = kH + 1;             // more than the lent memory holds
+  for (int i = 0; i < 5; ++i) {
+    extra.timeStamp = 10.0 + i;
+    engine->process(keys[i], buffers[i], extra);
+    EXPECT_EQ(buffers[i].data, nullptr) << i;
+  }
+  EXPECT_EQ(printed.text(),
+            "Failed to get a new frame record slot in getRequestImageBuffers\n"
+            "Failed to process non-GRAY/YUV format in continuous scanning mode\n"
+            "Skipped input frame: row stride 63 is smaller than a row of 64 bytes\n"
+            "Skipped input frame: image buffer holds 3072 bytes, a 64x49 image needs 3136\n");
+  ASSERT_TRUE(jobIdle());
+  engine->pauseEngine();  // drops a held frame, if any
+  engine->resumeEngine();
+  for (int i = 0; i < 5; ++i) {
+    ImageBuffer again = lendable(OrzaVSMobile::GRAY);
+    engine->requestImageBuffer(again, key);
+    EXPECT_NE(again.data, nullptr) << "record " << i << " was lost";
+  }
+}
+
+TEST_F(EngineTest, BadFramesPrintOneLineAndLeaveTheEngineWorking) {
+  transport.answerEverything();
+  const auto bad = [&](int badFormat, int w, int h, int stride, bool pixels = true) {
+    return ImageBuffer(0, static_cast<OrzaVSMobile::ImageFormat>(badFormat), w, h, stride, 1,
+                       pixels ? textured.data() : nullptr);
+  };
+  const char* const unsupported = "Failed to process non-GRAY/YUV format in continuous scanning mode\n";
+  struct { const char* line; ImageBuffer image; } cases[] = {
+      {"Skipped input frame: image has no pixel data\n", bad(OrzaVSMobile::GRAY, kW, kH, kW, false)},
+      {"Skipped input frame: invalid image size 0x48\n", bad(OrzaVSMobile::GRAY, 0, kH, kW)},
+      {"Skipped input frame: invalid image size 64x-1\n", bad(OrzaVSMobile::NV12, kW, -1, kW)},
+      {"Skipped input frame: row stride -64 is smaller than a row of 64 bytes\n", bad(OrzaVSMobile::I420, kW, kH, -kW)},
+      {unsupported, bad(-1, kW, kH, kW)}, {unsupported, bad(8, kW, kH, kW)}};
+  ExtraFrameData extra;
+  for (auto c : cases) {
+    orzavs_test::StdoutCapture printed;
+    engine->process("", c.image, extra);
+    EXPECT_EQ(printed.text(), c.line);
+  }
+  EXPECT_TRUE(events.pointCounts().empty());
+  EXPECT_EQ(engine->lastTakenTime(), -1.0);
+  // Outside RUNNING: the defined lines, nothing lent, nothing processed.
+  engine->pauseEngine();
+  orzavs_test::StdoutCapture printed;
+  ImageBuffer other = lendable(OrzaVSMobile::GRAY);
+  std::string key = "kept";
+  engine->requestImageBuffer(other, key);
+  engine->process(key, cases[1].image, extra);
+  engine->processSingleImage(cases[1].image, extra);
+  EXPECT_EQ(printed.text(),
+            "Failed to request image buffer: TSE not in RUNNING state\n"
+            "Skipped input frame: TSE not in RUNNING state\n"
+            "Skipped input frame: TSE not in RUNNING state\n");
+  EXPECT_EQ(other.data, nullptr);
+  EXPECT_EQ(key, "kept");
+  engine->resumeEngine();
+  frame(0.0);  // still works
+  ASSERT_TRUE(waitFor([&] { return events.decoded().size() == 1; }));
+}
+
+TEST_F(EngineTest, SingleImageReturnsOnlyAfterTheReplyWasHandled) {
+  transport.answerEverything(orzavs_test::Ms(30));
+  const int stride = kW * 3 + 8;  // any layout is accepted here: padded BGR
+  std::vector<uint8_t> bgr = orzavs_test::makeFrame(kW * 3, kH, stride, OrzaVSMobile::BGR);
+  ImageBuffer image(0, OrzaVSMobile::BGR, kW, kH, stride, 3, bgr.data());
+  ExtraFrameData extra;
+  extra.screenOrient = 270;
+  engine->processSingleImage(image, extra);
+  ASSERT_EQ(events.decoded().size(), 1u);  // already there
+  EXPECT_EQ(events.metadata()[0].queryID, transport.sent()[0].id);
+  EXPECT_TRUE(events.pointCounts().empty());
+  EXPECT_EQ(transport.sent()[0].metadata.at("orientation"), "0");
+  EXPECT_EQ(transport.sent()[0].body.at(0), 0xFF);
+  transport.setResponder([](const orzavs_test::SentRequest&, Tovra::Server::ServerResponse& r, orzavs_test::Ms&) {
+    r.responseCode = 500;
+    return true;
+  });
+  orzavs_test::StdoutCapture printed;
+  engine->processSingleImage(image, extra);
+  ImageBuffer narrow(0, OrzaVSMobile::BGR, kW, kH, kW * 2, 3, bgr.data());
+  engine->processSingleImage(narrow, extra);
+  EXPECT_EQ(printed.text(),
+            "VSS SERVER ERROR: response: \n"
+            "Skipped input frame: row stride 128 is smaller than a row of 192 bytes\n");
+  ASSERT_EQ(events.errors().size(), 1u);
+  EXPECT_EQ(events.errors()[0].code, 500);
+}
+
+}  // namespace

@@ -101,16 +101,12 @@ inline Detection suppress(const Detection& raw) {
   return kept;
 }
 
-// Exactly the bytes a plane of this geometry spans: (height-1)*stride + width.
-inline size_t planeBytes(int width, int height, int stride) {
-  return static_cast<size_t>(height - 1) * static_cast<size_t>(stride) + static_cast<size_t>(width);
-}
-
-// Planes of several kinds, every byte (row padding included) drawn from `rng`.
+// Planes of several kinds, exactly the (height-1)*stride + width bytes their geometry spans,
+// every byte (row padding included) drawn from `rng`.
 enum class Content { Noise, LowContrast, Blocks, Extremes };
 
 inline std::vector<uint8_t> makePlane(int width, int height, int stride, Content content, std::mt19937& rng) {
-  std::vector<uint8_t> p(planeBytes(width, height, stride));
+  std::vector<uint8_t> p(static_cast<size_t>(height - 1) * stride + static_cast<size_t>(width));
   std::uniform_int_distribution<int> any(0, 255);
   for (auto& v : p) v = static_cast<uint8_t>(any(rng));  // padding keeps this garbage
   for (int y = 0; y < height; ++y) {

@@ -3,73 +3,57 @@
 #include <gtest/gtest.h>
 
 #include <array>
+#include <ostream>
 #include <random>
 #include <string>
 #include <vector>
 
 #include "Fast9Reference.h"
 
+namespace OrzaVSMobile {
+void PrintTo(const Fast9Corner& c, std::ostream* out) { *out << "(" << c.x << "," << c.y << ")"; }
+}  // namespace OrzaVSMobile
+
 namespace {
 
 using namespace OrzaVSMobile;
 using fast9ref::Content;
 using fast9ref::GuardedPlane;
+using Result = fast9ref::Detection;
+constexpr Fast9Path kPaths[] = {Fast9Path::Best, Fast9Path::Scalar};
 
-struct Result {
-  std::vector<Fast9Corner> corners;
-  std::vector<int> scores;
-};
-
-Result detect(const uint8_t* plane, int w, int h, int stride, int b, Fast9Path path) {
+Result detect(const uint8_t* plane, int w, int h, int stride, int b, Fast9Path path, bool nonmax = false) {
   Result r;
-  fast9Detect(plane, w, h, stride, b, r.corners, r.scores, path);
+  (nonmax ? fast9DetectNonmax : fast9Detect)(plane, w, h, stride, b, r.corners, r.scores, path);
   return r;
 }
 
-Result detectNonmax(const uint8_t* plane, int w, int h, int stride, int b, Fast9Path path) {
-  Result r;
-  fast9DetectNonmax(plane, w, h, stride, b, r.corners, r.scores, path);
-  return r;
+void assertSame(const Result& actual, const Result& expected) {
+  ASSERT_EQ(actual.corners, expected.corners);
+  ASSERT_EQ(actual.scores, expected.scores);
 }
 
-std::string describe(const std::vector<Fast9Corner>& c, const std::vector<int>& s) {
-  std::string out;
-  for (size_t i = 0; i < c.size() && i < 12; ++i) {
-    out += "(" + std::to_string(c[i].x) + "," + std::to_string(c[i].y) + ":" +
-           (i < s.size() ? std::to_string(s[i]) : std::string("?")) + ") ";
-  }
-  return out + (c.size() > 12 ? "..." : "");
-}
-
-// Both kernels, raw and suppressed, and the list suppression, against the reference.
-void expectMatchesReference(const uint8_t* plane, int w, int h, int stride, int b, const std::string& what) {
-  SCOPED_TRACE(what + " " + std::to_string(w) + "x" + std::to_string(h) + " stride " + std::to_string(stride) +
-               " b " + std::to_string(b));
-  const fast9ref::Detection raw = fast9ref::detect(plane, w, h, stride, b);
-  const fast9ref::Detection kept = fast9ref::suppress(raw);
-  for (Fast9Path path : {Fast9Path::Best, Fast9Path::Scalar}) {
+// Both kernels, raw and suppressed, and the list suppression give the same corners and scores:
+// those of the reference detector (small planes) or else those of the scalar kernel.
+void expectAgreement(const uint8_t* plane, int w, int h, int stride, int b, bool reference) {
+  SCOPED_TRACE(std::to_string(w) + "x" + std::to_string(h) + " stride " + std::to_string(stride) + " b " +
+               std::to_string(b));
+  const Result raw = reference ? fast9ref::detect(plane, w, h, stride, b) : detect(plane, w, h, stride, b, Fast9Path::Scalar);
+  const Result kept = reference ? fast9ref::suppress(raw) : detect(plane, w, h, stride, b, Fast9Path::Scalar, true);
+  for (Fast9Path path : kPaths) {
     SCOPED_TRACE(path == Fast9Path::Best ? "best path" : "scalar path");
-    const Result r = detect(plane, w, h, stride, b, path);
-    ASSERT_EQ(r.corners, raw.corners) << describe(r.corners, r.scores) << " vs " << describe(raw.corners, raw.scores);
-    ASSERT_EQ(r.scores, raw.scores);
-    const Result k = detectNonmax(plane, w, h, stride, b, path);
-    ASSERT_EQ(k.corners, kept.corners) << describe(k.corners, k.scores) << " vs "
-                                       << describe(kept.corners, kept.scores);
-    ASSERT_EQ(k.scores, kept.scores);
+    ASSERT_NO_FATAL_FAILURE(assertSame(detect(plane, w, h, stride, b, path), raw));
+    ASSERT_NO_FATAL_FAILURE(assertSame(detect(plane, w, h, stride, b, path, true), kept));
   }
   Result listKept;
   fast9Suppress(raw.corners.data(), raw.scores.data(), raw.corners.size(), listKept.corners, listKept.scores);
-  ASSERT_EQ(listKept.corners, kept.corners);
-  ASSERT_EQ(listKept.scores, kept.scores);
+  assertSame(listKept, kept);
 }
 
-// A plane of value `background` with single-pixel dots.
-struct Dot {
-  int x, y, value;
-};
-std::vector<uint8_t> dotPlane(int w, int h, const std::vector<Dot>& dots, uint8_t background = 0) {
+// A w x h plane of value `background` with single-pixel dots {x, y, value}.
+std::vector<uint8_t> dotPlane(int w, int h, const std::vector<std::array<int, 3>>& dots, uint8_t background = 0) {
   std::vector<uint8_t> p(static_cast<size_t>(w) * h, background);
-  for (const Dot& d : dots) p[static_cast<size_t>(d.y) * w + d.x] = static_cast<uint8_t>(d.value);
+  for (const auto& d : dots) p[static_cast<size_t>(d[1]) * w + d[0]] = static_cast<uint8_t>(d[2]);
   return p;
 }
 
@@ -77,85 +61,78 @@ std::vector<uint8_t> dotPlane(int w, int h, const std::vector<Dot>& dots, uint8_
 // the paired blocks; contents cover flat areas, noise, low contrast and saturating values.
 TEST(Fast9Test, MatchesReferenceOnVariedPlanes) {
   std::mt19937 rng(1234);
-  const int widths[] = {7, 8, 13, 21, 22, 23, 30, 37, 38, 39, 54, 70, 71};
-  const int heights[] = {7, 8, 12, 19};
   const int thresholds[] = {-40, 0, 1, 7, 20, 50, 90, 160, 254, 255};  // negative: brighter and darker at once
-  const Content contents[] = {Content::Noise, Content::LowContrast, Content::Blocks, Content::Extremes};
-  const char* names[] = {"noise", "low contrast", "blocks", "extremes"};
-  for (int ci = 0; ci < 4; ++ci) {
-    for (int w : widths) {
-      for (int h : heights) {
+  for (Content content : {Content::Noise, Content::LowContrast, Content::Blocks, Content::Extremes}) {
+    SCOPED_TRACE("content " + std::to_string(static_cast<int>(content)));
+    for (int w : {7, 8, 13, 21, 22, 23, 30, 37, 38, 39, 54, 70, 71}) {
+      for (int h : {7, 8, 12, 19}) {
         const int stride = w + static_cast<int>(rng() % 3) * 7;  // packed or padded rows
         const int b = thresholds[rng() % 10];
-        const std::vector<uint8_t> bytes = fast9ref::makePlane(w, h, stride, contents[ci], rng);
-        GuardedPlane plane(bytes);
-        expectMatchesReference(plane.data(), w, h, stride, b, names[ci]);
+        GuardedPlane plane(fast9ref::makePlane(w, h, stride, content, rng));
+        expectAgreement(plane.data(), w, h, stride, b, true);
       }
     }
   }
 }
 
-TEST(Fast9Test, MoreThan512CornersAreAllKept) {
-  std::mt19937 rng(99);
-  const int w = 150, h = 110;
-  const std::vector<uint8_t> bytes = fast9ref::makePlane(w, h, w, Content::Noise, rng);
-  GuardedPlane plane(bytes);
+// Larger planes than the reference can afford: the kernels against each other; and one plane
+// with more than 512 corners (all kept) against the reference.
+TEST(Fast9Test, KernelsAgreeOnLargePlanesAndKeepManyCorners) {
+  std::mt19937 rng(2024);
+  for (int round = 0; round < 24; ++round) {
+    const int w = 7 + static_cast<int>(rng() % 300), h = 7 + static_cast<int>(rng() % 60);
+    const int stride = w + static_cast<int>(rng() % 20);
+    GuardedPlane plane(fast9ref::makePlane(w, h, stride, static_cast<Content>(rng() % 4), rng));
+    for (int b : {0, static_cast<int>(rng() % 255), 50}) expectAgreement(plane.data(), w, h, stride, b, false);
+  }
+  GuardedPlane noise(fast9ref::makePlane(150, 110, 150, Content::Noise, rng));
   for (int b : {20, 50}) {
-    const Result raw = detect(plane.data(), w, h, w, b, Fast9Path::Best);
-    const Result kept = detectNonmax(plane.data(), w, h, w, b, Fast9Path::Best);
-    EXPECT_GT(raw.corners.size(), 512u);
-    EXPECT_GT(kept.corners.size(), 512u);
-    expectMatchesReference(plane.data(), w, h, w, b, "noise");
+    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best).corners.size(), 512u);
+    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best, true).corners.size(), 512u);
+    expectAgreement(noise.data(), 150, 110, 150, b, true);
   }
 }
 
-TEST(Fast9Test, ComparisonsAreStrict) {
-  // Centre 100; an arc of 9 circle pixels at 100 + d, the rest at 100.
+TEST(Fast9Test, ComparisonsAreStrictAndNeedNineContiguousPixels) {
+  // Centre 100 at (4, 4); `count` circle pixels from position `first` on at `value`.
+  auto arc = [](int first, int count, int value) {
+    std::vector<uint8_t> p(9 * 9, 100);
+    for (int i = 0; i < count; ++i) {
+      const int* o = fast9ref::kCircle[(first + i) % 16];
+      p[static_cast<size_t>(4 + o[1]) * 9 + 4 + o[0]] = static_cast<uint8_t>(value);
+    }
+    return p;
+  };
   for (int polarity : {1, -1}) {
     for (int d : {50, 51, 52}) {
-      std::vector<uint8_t> p(9 * 9, 100);
-      for (int i = 0; i < 9; ++i) {
-        const int* o = fast9ref::kCircle[(i + 5) % 16];
-        p[static_cast<size_t>(4 + o[1]) * 9 + 4 + o[0]] = static_cast<uint8_t>(100 + polarity * d);
-      }
+      const std::vector<uint8_t> p = arc(5, 9, 100 + polarity * d);
       const Result r = detect(p.data(), 9, 9, 9, 50, Fast9Path::Best);
-      const Result s = detect(p.data(), 9, 9, 9, 50, Fast9Path::Scalar);
-      EXPECT_EQ(r.corners, s.corners);
+      EXPECT_EQ(r.corners, detect(p.data(), 9, 9, 9, 50, Fast9Path::Scalar).corners);
       if (d == 50) {
         EXPECT_TRUE(r.corners.empty()) << "difference equal to the threshold is no corner";
       } else {
-        ASSERT_EQ(r.corners.size(), 1u);
-        EXPECT_EQ(r.corners[0], (Fast9Corner{4, 4}));
+        ASSERT_EQ(r.corners, (std::vector<Fast9Corner>{{4, 4}}));
         EXPECT_EQ(r.scores[0], d - 1);  // highest t with d > t
       }
     }
   }
-  // Eight contiguous pixels are not enough.
-  std::vector<uint8_t> p(9 * 9, 100);
-  for (int i = 0; i < 8; ++i) {
-    const int* o = fast9ref::kCircle[(i + 12) % 16];  // wraps from 15 to 0
-    p[static_cast<size_t>(4 + o[1]) * 9 + 4 + o[0]] = 250;
-  }
-  EXPECT_TRUE(detect(p.data(), 9, 9, 9, 10, Fast9Path::Best).corners.empty());
-  const int* o = fast9ref::kCircle[4];
-  p[static_cast<size_t>(4 + o[1]) * 9 + 4 + o[0]] = 250;  // ninth, across the wrap
-  EXPECT_EQ(detect(p.data(), 9, 9, 9, 10, Fast9Path::Best).corners.size(), 1u);
+  // Eight contiguous pixels are not enough; the ninth may sit across the wrap from 15 to 0.
+  EXPECT_TRUE(detect(arc(12, 8, 250).data(), 9, 9, 9, 10, Fast9Path::Best).corners.empty());
+  EXPECT_EQ(detect(arc(12, 9, 250).data(), 9, 9, 9, 10, Fast9Path::Best).corners.size(), 1u);
 }
 
 TEST(Fast9Test, UniformPlaneAndBorders) {
   const int w = 40, h = 30;
   std::vector<uint8_t> flat(static_cast<size_t>(w) * h, 77);
-  EXPECT_TRUE(detect(flat.data(), w, h, w, 0, Fast9Path::Best).corners.empty());
-  EXPECT_TRUE(detect(flat.data(), w, h, w, 0, Fast9Path::Scalar).corners.empty());
   // Dots right at the tested band's edge are found; one pixel further out they are not.
-  const std::vector<Dot> inside = {{3, 3, 200}, {w - 4, 3, 200}, {3, h - 4, 200}, {w - 4, h - 4, 200}};
-  const std::vector<Dot> outside = {{2, 10, 200}, {w - 3, 10, 200}, {10, 2, 200}, {20, h - 3, 200}};
-  for (Fast9Path path : {Fast9Path::Best, Fast9Path::Scalar}) {
-    const std::vector<uint8_t> in = dotPlane(w, h, inside);
-    const Result r = detectNonmax(in.data(), w, h, w, 50, path);
+  const std::vector<std::array<int, 3>> inside = {{3, 3, 200}, {w - 4, 3, 200}, {3, h - 4, 200}, {w - 4, h - 4, 200}};
+  const std::vector<uint8_t> in = dotPlane(w, h, inside);
+  const std::vector<uint8_t> out = dotPlane(w, h, {{2, 10, 200}, {w - 3, 10, 200}, {10, 2, 200}, {20, h - 3, 200}});
+  for (Fast9Path path : kPaths) {
+    EXPECT_TRUE(detect(flat.data(), w, h, w, 0, path).corners.empty());
+    const Result r = detect(in.data(), w, h, w, 50, path, true);
     ASSERT_EQ(r.corners.size(), 4u);
-    for (size_t i = 0; i < 4; ++i) EXPECT_EQ(r.corners[i], (Fast9Corner{inside[i].x, inside[i].y}));
-    const std::vector<uint8_t> out = dotPlane(w, h, outside);
+    for (size_t i = 0; i < 4; ++i) EXPECT_EQ(r.corners[i], (Fast9Corner{inside[i][0], inside[i][1]}));
     EXPECT_TRUE(detect(out.data(), w, h, w, 50, path).corners.empty());
   }
 }
@@ -163,18 +140,14 @@ TEST(Fast9Test, UniformPlaneAndBorders) {
 TEST(Fast9Test, EqualNeighboursSuppressEachOther) {
   const int w = 30, h = 30;
   // Two-pixel blobs: each pixel sees only background on its circle, so its score is value-1.
-  struct Case {
-    int dx, dy, second;
-    size_t kept;
-  };
-  const Case cases[] = {{1, 0, 200, 0}, {0, 1, 200, 0}, {1, 1, 200, 0}, {-1, 1, 200, 0},
-                        {1, 0, 201, 1}, {0, 1, 199, 1}, {1, 1, 150, 1}};
-  for (const Case& c : cases) {
+  const struct { int dx, dy, second; size_t kept; } cases[] = {
+      {1, 0, 200, 0}, {0, 1, 200, 0}, {1, 1, 200, 0}, {-1, 1, 200, 0}, {1, 0, 201, 1}, {0, 1, 199, 1}, {1, 1, 150, 1}};
+  for (const auto& c : cases) {
     SCOPED_TRACE(std::to_string(c.dx) + "," + std::to_string(c.dy) + " second " + std::to_string(c.second));
     const std::vector<uint8_t> p = dotPlane(w, h, {{14, 14, 200}, {14 + c.dx, 14 + c.dy, c.second}});
-    for (Fast9Path path : {Fast9Path::Best, Fast9Path::Scalar}) {
+    for (Fast9Path path : kPaths) {
       EXPECT_EQ(detect(p.data(), w, h, w, 50, path).corners.size(), 2u);
-      const Result k = detectNonmax(p.data(), w, h, w, 50, path);
+      const Result k = detect(p.data(), w, h, w, 50, path, true);
       ASSERT_EQ(k.corners.size(), c.kept);
       if (c.kept == 1) {
         const bool firstWins = c.second < 200;
@@ -188,13 +161,12 @@ TEST(Fast9Test, EqualNeighboursSuppressEachOther) {
 TEST(Fast9Test, DegenerateGeometryHasNoCornersAndReadsNothingOutside) {
   std::mt19937 rng(3);
   auto expectNone = [](const uint8_t* p, int w, int h, int stride) {
-    for (Fast9Path path : {Fast9Path::Best, Fast9Path::Scalar}) {
-      Result r{{Fast9Corner{1, 1}}, {9}};  // stale content must be cleared
-      fast9Detect(p, w, h, stride, 20, r.corners, r.scores, path);
-      EXPECT_TRUE(r.corners.empty() && r.scores.empty()) << w << "x" << h << " stride " << stride;
-      r = Result{{Fast9Corner{1, 1}}, {9}};
-      fast9DetectNonmax(p, w, h, stride, 20, r.corners, r.scores, path);
-      EXPECT_TRUE(r.corners.empty() && r.scores.empty()) << w << "x" << h << " stride " << stride;
+    for (Fast9Path path : kPaths) {
+      for (auto* run : {&fast9Detect, &fast9DetectNonmax}) {
+        Result r{{Fast9Corner{1, 1}}, {9}};  // stale content must be cleared
+        run(p, w, h, stride, 20, r.corners, r.scores, path);
+        EXPECT_TRUE(r.corners.empty() && r.scores.empty()) << w << "x" << h << " stride " << stride;
+      }
     }
   };
   const std::vector<uint8_t> big = fast9ref::makePlane(64, 64, 64, Content::Noise, rng);
@@ -206,35 +178,6 @@ TEST(Fast9Test, DegenerateGeometryHasNoCornersAndReadsNothingOutside) {
   for (const auto& g : {std::array<int, 2>{1, 1}, {6, 30}, {30, 6}, {7, 6}, {6, 7}}) {
     GuardedPlane p(fast9ref::makePlane(g[0], g[1], g[0], Content::Noise, rng));
     expectNone(p.data(), g[0], g[1], g[0]);
-  }
-}
-
-// Larger planes than the reference can afford: the two kernels against each other, and the
-// fused suppression against the list suppression.
-TEST(Fast9Test, VectorAndScalarKernelsAgree) {
-  std::mt19937 rng(2024);
-  for (int round = 0; round < 24; ++round) {
-    const int w = 7 + static_cast<int>(rng() % 300), h = 7 + static_cast<int>(rng() % 60);
-    const int stride = w + static_cast<int>(rng() % 20);
-    const Content content = static_cast<Content>(rng() % 4);
-    const std::vector<uint8_t> bytes = fast9ref::makePlane(w, h, stride, content, rng);
-    GuardedPlane plane(bytes);
-    for (int b : {0, static_cast<int>(rng() % 255), 50}) {
-      SCOPED_TRACE(std::to_string(w) + "x" + std::to_string(h) + " stride " + std::to_string(stride) + " b " +
-                   std::to_string(b));
-      const Result vr = detect(plane.data(), w, h, stride, b, Fast9Path::Best);
-      const Result sr = detect(plane.data(), w, h, stride, b, Fast9Path::Scalar);
-      ASSERT_EQ(vr.corners, sr.corners);
-      ASSERT_EQ(vr.scores, sr.scores);
-      const Result vk = detectNonmax(plane.data(), w, h, stride, b, Fast9Path::Best);
-      const Result sk = detectNonmax(plane.data(), w, h, stride, b, Fast9Path::Scalar);
-      ASSERT_EQ(vk.corners, sk.corners);
-      ASSERT_EQ(vk.scores, sk.scores);
-      Result lk;
-      fast9Suppress(vr.corners.data(), vr.scores.data(), vr.corners.size(), lk.corners, lk.scores);
-      ASSERT_EQ(vk.corners, lk.corners);
-      ASSERT_EQ(vk.scores, lk.scores);
-    }
   }
 }
 

@@ -85,6 +85,7 @@ TEST(InterestPointsTest, UpToFiftyInRowMajorOrderThenTheFiftyBest) {
   }
 }
 
+// Noise gives many more kept corners than 50: the selection must be the step's, exactly.
 TEST(InterestPointsTest, NoisyFramesKeepTheFiftyBestKeptCorners) {
   std::mt19937 rng(77);
   for (int round = 0; round < 4; ++round) {
@@ -92,26 +93,8 @@ TEST(InterestPointsTest, NoisyFramesKeepTheFiftyBestKeptCorners) {
     const int stride = w + static_cast<int>(rng() % 9);
     std::vector<uint8_t> p = fast9ref::makePlane(w, h, stride, fast9ref::Content::Noise, rng);
     const std::vector<Point2f> points = runGray(p, w, h, stride);
+    ASSERT_EQ(points.size(), 50u);
     expectSamePoints(points, referenceStep(p.data(), w, h, stride));
-    // Independently of the selection's order: 50 distinct kept corners, none left out scoring
-    // above one taken.
-    std::vector<Fast9Corner> kept;
-    std::vector<int> scores;
-    fast9DetectNonmax(p.data(), w, h, stride, 50, kept, scores);
-    ASSERT_GT(kept.size(), 50u);
-    std::vector<bool> taken(kept.size(), false);
-    for (const Point2f& pt : points) {
-      const auto it = std::find(kept.begin(), kept.end(), Fast9Corner{static_cast<int>(pt.x), static_cast<int>(pt.y)});
-      ASSERT_NE(it, kept.end());
-      ASSERT_FALSE(taken[static_cast<size_t>(it - kept.begin())]);
-      taken[static_cast<size_t>(it - kept.begin())] = true;
-    }
-    int lowestTaken = 1000, highestLeft = -1000;
-    for (size_t i = 0; i < kept.size(); ++i) {
-      if (taken[i]) lowestTaken = std::min(lowestTaken, scores[i]);
-      if (!taken[i]) highestLeft = std::max(highestLeft, scores[i]);
-    }
-    EXPECT_GE(lowestTaken, highestLeft);
   }
 }
 

@@ -6,8 +6,10 @@
 #include <type_traits>
 #include <vector>
 
-#include "types/EnumNames.h"
 #include "exec/Job.h"
+#include "exec/TovraExecutionEngine.h"
+#include "types/DiagnosticOutput.h"
+#include "types/EnumNames.h"
 #include "types/EventDelegateBase.h"
 #include "types/ImageFormat.h"
 #include "types/ObjectInfo.h"
@@ -36,15 +38,12 @@ TEST(ObjectInfoTest, DefaultsAndDeepCopies) {
   EXPECT_EQ(2, qr.contentType);
   EXPECT_EQ(6, qr.srcObjectModule);
 
-  ObjectInfo source(Tovra::PIDN);
-  source.content = "root";
-  ObjectInfo child(Tovra::SEARCH_TERMS);
   ObjectInfo grandchild(Tovra::BOUNDING_BOX_CONTENT_TYPE);
   grandchild.content = "grandchild";
   grandchild.location = {{5.0f, 6.0f}};
-  child.subContents.push_back(grandchild);
-  source.subContents.push_back(child);
-  ObjectInfo target(Tovra::QR_CODE);
+  ObjectInfo child(Tovra::SEARCH_TERMS), source(Tovra::PIDN), target(Tovra::QR_CODE);
+  child.subContents = {grandchild};
+  source.subContents = {child};
   target.subContents.resize(5);
   target = source;
   ASSERT_EQ(1u, target.subContents.size());
@@ -73,34 +72,22 @@ TEST(ResultMetadataTest, ClearMakesItEqualToAFreshOne) {
 }
 
 TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {
+#define ORZAVS_NAMED(e) {Tovra::e, #e}
   const std::map<Tovra::ObjectModuleID, std::string> modules = {
-      {Tovra::BARCODE_MOD, "BARCODE_MOD"},
-      {Tovra::VISUAL_SEARCH_SERVICE_MOD, "VISUAL_SEARCH_SERVICE_MOD"},
-      {Tovra::TWOD_BARCODE_MOD, "TWOD_BARCODE_MOD"},
-      {Tovra::PACKAGE_LABEL_MOD, "PACKAGE_LABEL_MOD"},
-      {Tovra::GIFTCARD_MOD, "GIFTCARD_MOD"},
-      {Tovra::UNSPECIFIED_OBJECT_MOD, "UNSPECIFIED_OBJECT_MOD"},
-      {Tovra::NUM_OBJECT_MODS, "NUM_OBJECT_MODS"},
-  };
+      ORZAVS_NAMED(BARCODE_MOD), ORZAVS_NAMED(VISUAL_SEARCH_SERVICE_MOD), ORZAVS_NAMED(TWOD_BARCODE_MOD),
+      ORZAVS_NAMED(PACKAGE_LABEL_MOD), ORZAVS_NAMED(GIFTCARD_MOD), ORZAVS_NAMED(UNSPECIFIED_OBJECT_MOD),
+      ORZAVS_NAMED(NUM_OBJECT_MODS)};
+  const std::map<Tovra::ContentType, std::string> contents = {
+      ORZAVS_NAMED(BARCODE_UPC_EAN), ORZAVS_NAMED(BARCODE_128), ORZAVS_NAMED(QR_CODE), ORZAVS_NAMED(DATA_MATRIX),
+      ORZAVS_NAMED(PDF_417), ORZAVS_NAMED(GIFT_CARD), ORZAVS_NAMED(PIDN), ORZAVS_NAMED(SEARCH_TERMS),
+      ORZAVS_NAMED(DIRECTED_RESULT), ORZAVS_NAMED(EXTERNAL_RESULT), ORZAVS_NAMED(UNSPECIFIED_CONTENT_TYPE),
+      ORZAVS_NAMED(NUM_CONTENT_TYPES)};
+#undef ORZAVS_NAMED
   EXPECT_EQ(modules, Tovra::ObjectModuleIDNames);
+  EXPECT_EQ(contents, Tovra::ContentTypeNames);
+  // The unnamed slots 5 and 10, and the last values.
   EXPECT_EQ(0u, Tovra::ObjectModuleIDNames.count(static_cast<Tovra::ObjectModuleID>(5)));
   EXPECT_EQ("NUM_OBJECT_MODS", Tovra::ObjectModuleIDNames.at(static_cast<Tovra::ObjectModuleID>(7)));
-
-  const std::map<Tovra::ContentType, std::string> contents = {
-      {Tovra::BARCODE_UPC_EAN, "BARCODE_UPC_EAN"},
-      {Tovra::BARCODE_128, "BARCODE_128"},
-      {Tovra::QR_CODE, "QR_CODE"},
-      {Tovra::DATA_MATRIX, "DATA_MATRIX"},
-      {Tovra::PDF_417, "PDF_417"},
-      {Tovra::GIFT_CARD, "GIFT_CARD"},
-      {Tovra::PIDN, "PIDN"},
-      {Tovra::SEARCH_TERMS, "SEARCH_TERMS"},
-      {Tovra::DIRECTED_RESULT, "DIRECTED_RESULT"},
-      {Tovra::EXTERNAL_RESULT, "EXTERNAL_RESULT"},
-      {Tovra::UNSPECIFIED_CONTENT_TYPE, "UNSPECIFIED_CONTENT_TYPE"},
-      {Tovra::NUM_CONTENT_TYPES, "NUM_CONTENT_TYPES"},
-  };
-  EXPECT_EQ(contents, Tovra::ContentTypeNames);
   EXPECT_EQ(0u, Tovra::ContentTypeNames.count(static_cast<Tovra::ContentType>(10)));
   EXPECT_EQ("NUM_CONTENT_TYPES", Tovra::ContentTypeNames.at(static_cast<Tovra::ContentType>(12)));
 }
@@ -146,4 +133,16 @@ TEST(EventDelegateBaseTest, BaseAbsorbsEveryCallAndAnOverrideSeesOnlyItsOwn) {
   EXPECT_EQ(std::vector<std::string>{"0q"}, decodeOnly->decoded);  // an empty list keeps its metadata
   owner.reset();
   EXPECT_TRUE(destroyed);  // destroyed through the base pointer
+}
+
+TEST(Diagnostics, DefaultSinkWritesEachLineAndANewlineToStandardOutput) {
+  const std::string reply(300, 'x');  // past the formatting buffer of short lines
+  testing::internal::CaptureStdout();
+  Tovra::TovraExecutionEngine none(0);
+  OrzaVSMobile::reportLinef("VSS SERVER ERROR: response: %s", reply.c_str());
+  OrzaVSMobile::reportLinef("Skipped input frame: invalid image size %dx%d", -1, 0);
+  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+            "Initialized TovraExecutionEngine with invalid number of threads\n"
+            "VSS SERVER ERROR: response: " + reply + "\n"
+            "Skipped input frame: invalid image size -1x0\n");
 }

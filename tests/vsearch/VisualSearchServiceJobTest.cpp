@@ -15,7 +15,7 @@ namespace {
 
 using orzavs_test::replyBody;
 using Tovra::FrameRecord;
-using Tovra::Server::ServerResponse;
+using orzavs_test::makeResponse;
 
 std::shared_ptr<FrameRecord> makeRecord(int w, int h, int format, int orient = 0, uint64_t frameId = 7) {
   auto r = std::make_shared<FrameRecord>();
@@ -27,12 +27,6 @@ std::shared_ptr<FrameRecord> makeRecord(int w, int h, int format, int orient = 0
   r->format = format;
   r->screenOrient = orient;
   r->pixels = orzavs_test::makeFrame(r->widthStep, h, r->widthStep, format);
-  return r;
-}
-
-ServerResponse reply(const std::string& id, int code, const std::string& body, double rtt = -1.0) {
-  ServerResponse r = orzavs_test::makeResponse(id, body, code);
-  r.roundtripTime = rtt;
   return r;
 }
 
@@ -51,6 +45,7 @@ class JobTest : public ::testing::Test {
     EXPECT_EQ(job->state(), Tovra::AwaitingReply);
     return transport.sent().back().id;
   }
+  std::string sendGray(int orient = 0) { return send(makeRecord(32, 32, OrzaVSMobile::GRAY, orient)); }
   orzavs_test::RecordingEvents events;
   orzavs_test::FakeTransport transport;
   std::unique_ptr<Tovra::VisualSearchServiceJob> job;  // destroyed before the transport
@@ -73,7 +68,7 @@ TEST_F(JobTest, SendsADecodableJpegAndLetsGoOfTheFrame) {
       ASSERT_TRUE(Tovra::encodeYUVToJpeg(record->pixels.data(), 24, 40, 40, OrzaVSMobile::NV21, expected, 50, work));
       EXPECT_EQ(sent.body, expected);
     }
-    transport.pushServerResponse(reply(id, 200, replyBody("Q")));
+    transport.pushServerResponse(makeResponse(id, replyBody("Q")));
   }
 }
 
@@ -105,66 +100,72 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
 }
 
 TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
-  std::string id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
+  const struct { int code; const char* body; Tovra::Server::ResponseStatus status; } failures[] = {
+      {404, "not found", Tovra::Server::RESPONSE_SERVER_ERROR},
+      {200, "{\"queryId\":", Tovra::Server::RESPONSE_PARSE_ERROR},
+      {201, "{}", Tovra::Server::RESPONSE_SERVER_ERROR}};  // only 200 is success
   orzavs_test::StdoutCapture printed;
-  transport.pushServerResponse(reply(id, 404, "not found"));
-  id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
-  transport.pushServerResponse(reply(id, 200, "{\"queryId\":"));
-  id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
-  transport.pushServerResponse(reply(id, 201, "{}"));  // only 200 is success
-  EXPECT_EQ(printed.text(), "VSS SERVER ERROR: response: not found\n"
-            "VSS SERVER ERROR: response: {\"queryId\":\nVSS SERVER ERROR: response: {}\n");
+  std::string lines;
+  for (const auto& f : failures) {
+    transport.pushServerResponse(makeResponse(sendGray(), f.body, f.code));
+    lines += std::string("VSS SERVER ERROR: response: ") + f.body + "\n";
+  }
+  EXPECT_EQ(printed.text(), lines);
   ASSERT_EQ(events.errors().size(), 3u);
-  EXPECT_EQ(events.errors()[2].status, Tovra::Server::RESPONSE_SERVER_ERROR);
-  EXPECT_EQ(events.errors()[2].code, 201);
-  EXPECT_EQ(events.errors()[0].module, Tovra::VISUAL_SEARCH_SERVICE_MOD);
-  EXPECT_EQ(events.errors()[0].status, Tovra::Server::RESPONSE_SERVER_ERROR);
-  EXPECT_EQ(events.errors()[0].code, 404);
-  EXPECT_EQ(events.errors()[1].status, Tovra::Server::RESPONSE_PARSE_ERROR);
-  EXPECT_EQ(events.errors()[1].code, 200);
+  for (size_t i = 0; i < 3; ++i) {
+    EXPECT_EQ(events.errors()[i].module, Tovra::VISUAL_SEARCH_SERVICE_MOD);
+    EXPECT_EQ(events.errors()[i].status, failures[i].status);
+    EXPECT_EQ(events.errors()[i].code, failures[i].code);
+  }
 
-  id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
+  const std::string id = sendGray();
   std::string body = replyBody("Q7", {"PIDN", "Nope", "BoundingBox"});
   body.replace(body.find("\"properties\":{}}"), 16, "\"properties\":{},\"subContent\":[{\"content\":\"s\","
                                                      "\"contentType\":\"PIDN\",\"properties\":{}}]}");
-  transport.pushServerResponse(reply(id, 200, body, 1234.5678));
+  transport.pushServerResponse(makeResponse(id, body, 200, 1234.5678));
   ASSERT_EQ(events.decoded().size(), 1u);
   const auto objects = events.decoded()[0];
   ASSERT_EQ(objects.size(), 2u);  // 11 dropped, 6 and 10 kept in order
   EXPECT_EQ(objects[0].contentType, Tovra::PIDN);
   EXPECT_EQ(static_cast<int>(objects[1].contentType), 10);
-  EXPECT_EQ(objects[0].srcObjectModule, Tovra::VISUAL_SEARCH_SERVICE_MOD);
-  EXPECT_EQ(objects[1].srcObjectModule, Tovra::VISUAL_SEARCH_SERVICE_MOD);
+  for (const auto& object : objects) EXPECT_EQ(object.srcObjectModule, Tovra::VISUAL_SEARCH_SERVICE_MOD);
   EXPECT_EQ(objects[0].subContents.at(0).srcObjectModule, Tovra::UNSPECIFIED_OBJECT_MOD);
   EXPECT_EQ(job->state(), Tovra::Finished);
 
-  send(makeRecord(32, 32, OrzaVSMobile::GRAY, 90));
+  sendGray(90);
   const auto sent = transport.sent().back();
   EXPECT_EQ(sent.metadata.at("lastQueryId"), "Q7");
   EXPECT_EQ(sent.metadata.at("lastQueryRoundTripTime"), "1234.57");
   EXPECT_EQ(sent.metadata.at("orientation"), "180");
   EXPECT_NE(sent.params.at("vsearch_params_json").find("\"rotation\":\"90\""), std::string::npos);
-  transport.pushServerResponse(reply(sent.id, 200, replyBody("Q8", {"Other"})));
+  transport.pushServerResponse(makeResponse(sent.id, replyBody("Q8", {"Other"})));
   ASSERT_EQ(events.decoded().size(), 2u);
   EXPECT_TRUE(events.decoded()[1].empty());  // reported even when nothing is left
 }
 
-TEST_F(JobTest, OnlyAnAwaitingJobTakesAReplyAndOnlyOnce) {
-  const std::string id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
+TEST_F(JobTest, OnlyAnAwaitingLiveJobTakesAReplyAndOnlyOnce) {
+  std::string id = sendGray();
   job->cancel();
-  transport.pushServerResponse(reply(id, 200, replyBody("late")));
+  transport.pushServerResponse(makeResponse(id, replyBody("late")));
   EXPECT_EQ(events.replyCallbacks(), 0u);
   EXPECT_EQ(job->lastQueryId(), "");
-  send(makeRecord(32, 32, OrzaVSMobile::GRAY));
-  job->handleServerResponse(reply("any", 200, replyBody("first")));
-  job->handleServerResponse(reply("any", 200, replyBody("second")));
+  sendGray();
+  job->handleServerResponse(makeResponse("any", replyBody("first")));
+  job->handleServerResponse(makeResponse("any", replyBody("second")));
   ASSERT_EQ(events.metadata().size(), 1u);
   EXPECT_EQ(events.metadata()[0].queryID, "first");
+  // A destroyed job is withdrawn from the delegate.
+  id = sendGray();
+  EXPECT_GT(transport.pendingCount(), 0u);
+  job.reset();
+  EXPECT_EQ(transport.pendingCount(), 0u);
+  transport.pushServerResponse(makeResponse(id, replyBody("late")));
+  EXPECT_EQ(events.replyCallbacks(), 1u);
 }
 
 TEST_F(JobTest, AReplyPushedBeforeTheSendReturnsIsHandled) {
   transport.onSend = [this](const Tovra::Server::ServerRequest& request) {
-    transport.pushServerResponse(reply(request.id, 200, replyBody("sync")));
+    transport.pushServerResponse(makeResponse(request.id, replyBody("sync")));
   };
   job->markQueued();
   job->setFrameRecord(makeRecord(32, 32, OrzaVSMobile::GRAY));
@@ -177,18 +178,9 @@ TEST_F(JobTest, AReplyPushedBeforeTheSendReturnsIsHandled) {
   EXPECT_FALSE(job->isBusy());
   transport.onSend = nullptr;
   job->markQueued();
-  send(makeRecord(32, 32, OrzaVSMobile::GRAY));
+  sendGray();
   job->finishUnlessAwaiting();  // an awaiting job keeps its state
   EXPECT_EQ(job->state(), Tovra::AwaitingReply);
-}
-
-TEST_F(JobTest, ADestroyedJobIsWithdrawnFromTheDelegate) {
-  const std::string id = send(makeRecord(32, 32, OrzaVSMobile::GRAY));
-  EXPECT_EQ(transport.pendingCount(), 1u);
-  job.reset();
-  EXPECT_EQ(transport.pendingCount(), 0u);
-  transport.pushServerResponse(reply(id, 200, replyBody("late")));
-  EXPECT_EQ(events.replyCallbacks(), 0u);
 }
 
 }  // namespace

@@ -28,16 +28,22 @@ std::vector<uint8_t> pattern(size_t n) {
 
 }  // namespace
 
-TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIdsAndRestartsUpToAHeldOne) {
-  FrameRecordManager pool(5);
-  std::vector<std::shared_ptr<FrameRecord>> held;
+// Takes all five records of `pool`, expecting ids 0..4, and marks each with its `width`.
+void takeAll(FrameRecordManager& pool, std::vector<std::shared_ptr<FrameRecord>>& held, int expectedWidth) {
   for (uint64_t i = 0; i < 5; ++i) {
     held.push_back(pool.getNewSlot());
     ASSERT_NE(nullptr, held.back());
     EXPECT_EQ(i, held.back()->frameId);
+    EXPECT_EQ(expectedWidth, held.back()->width);  // a renewed record
     held.back()->width = 100 + static_cast<int>(i);
   }
   EXPECT_EQ(nullptr, pool.getNewSlot());  // the sixth finds nothing free
+}
+
+TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIdsAndRestartsUpToAHeldOne) {
+  FrameRecordManager pool(5);
+  std::vector<std::shared_ptr<FrameRecord>> held;
+  ASSERT_NO_FATAL_FAILURE(takeAll(pool, held, 0));
   held[2]->timeStamp = 12.5;
   FrameRecord* third = held[2].get();
   held[2].reset();
@@ -67,12 +73,7 @@ TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIdsAndRestartsUpTo
   orzavs_test::StdoutCapture out;
   EXPECT_TRUE(pool.restart());  // everything free: renewed and renumbered
   EXPECT_EQ("", out.text());
-  for (uint64_t i = 0; i < 5; ++i) {
-    std::shared_ptr<FrameRecord> record = pool.getNewSlot();
-    EXPECT_EQ(i, record->frameId);
-    EXPECT_EQ(0, record->width);
-    held.push_back(record);
-  }
+  takeAll(pool, held, 0);
 }
 
 TEST(FrameRecordTest, LentBuffersRoundRowsFirstAndAreTakenWithoutACopy) {

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <memory>
@@ -34,52 +35,35 @@ class CountingHandler : public Tovra::Server::ServerResponseHandler {
 
 }  // namespace
 
-// Several client threads push the same replies at once: each id reaches its handler exactly
-// once, however the pushes interleave.
-TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
-  constexpr size_t kIds = 400;
-  FakeTransport transport;
-  CountingHandler handler(kIds);
-  for (size_t i = 0; i < kIds; ++i) transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
-  std::vector<std::thread> pushers;
-  for (int p = 0; p < 4; ++p) {
-    pushers.emplace_back([&, p] {
-      for (size_t k = 0; k < kIds; ++k) {
-        transport.pushServerResponse(makeResponse("r" + std::to_string(p % 2 == 0 ? k : kIds - 1 - k)));
-      }
-    });
-  }
-  for (auto& t : pushers) t.join();
-  for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i)) << "id r" << i;
-  EXPECT_EQ(0u, transport.pendingCount());
-}
-
-// Requests are sent on one thread while their replies are pushed on another, as a job on the
-// worker thread and the client's network thread do. The two threads keep in step through
-// relaxed counters, which order nothing: only the delegate's own lock may order its table.
-TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
+// Requests are sent on one thread while two others push every reply, as a job on the worker
+// thread and the client's network threads do: each id reaches its handler exactly once, however
+// the pushes interleave. The threads keep in step through relaxed counters, which order nothing:
+// only the delegate's own lock may order its table.
+TEST(ServerDelegateConcurrencyTest, SendsAndRacingPushesOnOtherThreadsDeliverEachIdOnce) {
   constexpr size_t kIds = 600;
   FakeTransport transport;
   CountingHandler handler(kIds);
-  std::atomic<size_t> sent{0}, pushed{0};
+  std::atomic<size_t> sent{0}, pushed[2]{};
   std::thread sender([&] {
     for (size_t i = 0; i < kIds; ++i) {
-      while (i > pushed.load(std::memory_order_relaxed) + 4) std::this_thread::yield();
+      while (i > std::min(pushed[0].load(std::memory_order_relaxed), pushed[1].load(std::memory_order_relaxed)) + 4) {
+        std::this_thread::yield();
+      }
       transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
       sent.store(i + 1, std::memory_order_relaxed);
     }
   });
-  std::thread pusher([&] {
+  auto pusher = [&](std::atomic<size_t>& mine) {
     for (size_t next = 0; next < kIds; std::this_thread::yield()) {
       for (const size_t available = sent.load(std::memory_order_relaxed); next < available; ++next) {
         transport.pushServerResponse(makeResponse("r" + std::to_string(next)));
-        pushed.store(next + 1, std::memory_order_relaxed);
+        mine.store(next + 1, std::memory_order_relaxed);
       }
     }
-  });
-  sender.join();
-  pusher.join();
-  for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i));
+  };
+  std::thread first(pusher, std::ref(pushed[0])), second(pusher, std::ref(pushed[1]));
+  for (std::thread* t : {&sender, &first, &second}) t->join();
+  for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i)) << "id r" << i;
   EXPECT_EQ(0u, transport.pendingCount());
 }
 

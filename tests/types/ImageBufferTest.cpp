@@ -19,9 +19,7 @@ std::vector<uint8_t> pattern(size_t n, uint8_t start) {
   return bytes;
 }
 
-std::vector<uint8_t> contents(const ImageBuffer& buffer, int n) {
-  return std::vector<uint8_t>(buffer.data, buffer.data + n);
-}
+std::vector<uint8_t> contents(const ImageBuffer& buffer, int n) { return {buffer.data, buffer.data + n}; }
 
 // Every fill operation with a real source of `n` bytes copies nothing.
 void expectEveryFillCopiesNothing(ImageBuffer& buffer, int32_t n) {
@@ -36,8 +34,7 @@ void expectEveryFillCopiesNothing(ImageBuffer& buffer, int32_t n) {
 TEST(ImageBufferTest, DefaultAndBorrowingBuffersCannotBeFilled) {
   ImageBuffer buffer;
   EXPECT_EQ(1, static_cast<int32_t>(buffer.format));
-  EXPECT_EQ(nullptr, buffer.data);
-  EXPECT_EQ(0, buffer.allocLen);
+  EXPECT_TRUE(buffer.data == nullptr && buffer.allocLen == 0);
   expectEveryFillCopiesNothing(buffer, 16);
   buffer.allocLen = 16;  // a forged allocLen on a null buffer cannot make a fill write
   expectEveryFillCopiesNothing(buffer, 16);
@@ -67,13 +64,11 @@ TEST(ImageBufferTest, FillsCopyAtMostTheOwnBlock) {
   const std::vector<uint8_t> other = pattern(40, 200);
   EXPECT_EQ(40, buffer.fillBufferWithByteBuffer(other.data(), 40));
   EXPECT_EQ(3 + 40, buffer.data[40]);  // bytes past the fill keep their earlier contents
-
   // Null sources and negative lengths copy nothing.
   EXPECT_EQ(0, buffer.fillBuffer(nullptr, 32));
   EXPECT_EQ(0, buffer.fillBuffer(src.data(), -5));
   EXPECT_EQ(0, buffer.fillBufferWithByteBuffer(src.data(), INT32_MIN));
   EXPECT_EQ(200, buffer.data[0]);
-
   // allocLen is a public field (settable from Java): a forged one never reaches past the block.
   buffer.allocLen = 1 << 20;
   EXPECT_EQ(100, buffer.fillBuffer(src.data(), 150));
@@ -92,7 +87,6 @@ TEST(ImageBufferTest, FailedReleasedAndEmptyBlocksForbidEveryFill) {
   buffer.releaseBuffer();  // nothing is freed twice
   buffer.allocLen = 64;    // without the guard the fill would be a use after free
   expectEveryFillCopiesNothing(buffer, 64);
-
   EXPECT_EQ(0, buffer.allocateBuffer(-1));
   EXPECT_EQ(0, buffer.allocLen);
   expectEveryFillCopiesNothing(buffer, 8);
@@ -104,8 +98,7 @@ TEST(ImageBufferTest, FailedReleasedAndEmptyBlocksForbidEveryFill) {
 TEST(ImageBufferTest, TwoPlaneFillPlacesTheSecondAfterTheFirstWithinTheBlock) {
   ImageBuffer buffer;
   ASSERT_EQ(150, buffer.allocateBuffer(150));
-  const std::vector<uint8_t> luma = pattern(200, 0);
-  const std::vector<uint8_t> chroma = pattern(200, 100);
+  const std::vector<uint8_t> luma = pattern(200, 0), chroma = pattern(200, 100);
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), 100, chroma.data(), 100));
   std::vector<uint8_t> expected(luma.begin(), luma.begin() + 100);
   expected.insert(expected.end(), chroma.begin(), chroma.begin() + 50);
@@ -113,7 +106,6 @@ TEST(ImageBufferTest, TwoPlaneFillPlacesTheSecondAfterTheFirstWithinTheBlock) {
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), 200, chroma.data(), 100));
   EXPECT_EQ(std::vector<uint8_t>(luma.begin(), luma.begin() + 150), contents(buffer, 150));
   EXPECT_EQ(0, buffer.fillBufferWithByteBuffer(luma.data(), 0, chroma.data(), 0));
-
   // A bad plane contributes nothing; the other is still bounded by the block.
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), -20, chroma.data(), 200));
   EXPECT_EQ(100, buffer.data[0]);
@@ -146,10 +138,9 @@ TEST(ImageBufferTest, LentMemoryIsFilledWithinItsSizeAndNeverFreed) {
 TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer original(3, OrzaVSMobile::I420, 4, 4, 4, 1, nullptr);
   ASSERT_EQ(24, original.allocateBuffer(24));
-  const std::vector<uint8_t> src = pattern(24, 10);
+  const std::vector<uint8_t> src = pattern(24, 10), ones(24, 1), many = pattern(100, 1);
   ASSERT_EQ(24, original.fillBuffer(src.data(), 24));
-  ImageBuffer copy(original);
-  ImageBuffer assigned;
+  ImageBuffer copy(original), assigned;
   ASSERT_EQ(8, assigned.allocateBuffer(8));  // replaced (and freed) by the assignment
   assigned = original;
   for (ImageBuffer* duplicate : {&copy, &assigned}) {
@@ -157,7 +148,6 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
     EXPECT_EQ(3, duplicate->definition);
     EXPECT_EQ(src, contents(*duplicate, 24));
   }
-  const std::vector<uint8_t> ones(24, 1);
   original.releaseBuffer();  // the copies outlive the original's block
   ASSERT_EQ(24, assigned.fillBuffer(ones.data(), 24));
   ImageBuffer& alias = assigned;
@@ -165,14 +155,13 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   EXPECT_EQ(ones, contents(assigned, 24));
 
   std::vector<uint8_t> pixels(40, 0);
-  ImageBuffer lent;
+  ImageBuffer lent, lentCopy;
   lent.lend(pixels.data(), 40);
-  ImageBuffer lentCopy;
   lentCopy = lent;
   EXPECT_EQ(pixels.data(), lentCopy.data);
   lentCopy.allocLen = 4000;
   EXPECT_EQ(24, lentCopy.fillBuffer(src.data(), 24));
-  EXPECT_EQ(40, lentCopy.fillBuffer(pattern(100, 1).data(), 100));
+  EXPECT_EQ(40, lentCopy.fillBuffer(many.data(), 100));
 
   ImageBuffer released;
   ASSERT_EQ(16, released.allocateBuffer(16));
@@ -180,7 +169,6 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer releasedCopy(released);
   releasedCopy.allocLen = 16;
   expectEveryFillCopiesNothing(releasedCopy, 16);
-
   // A block whose allocLen was zeroed is still duplicated: a forged allocLen on the copy
   // cannot reach the original's memory.
   ImageBuffer zeroed;
@@ -189,27 +177,23 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer zeroedCopy(zeroed);
   EXPECT_NE(zeroed.data, zeroedCopy.data);
   zeroedCopy.allocLen = 100;
-  EXPECT_EQ(12, zeroedCopy.fillBuffer(pattern(100, 1).data(), 100));
+  EXPECT_EQ(12, zeroedCopy.fillBuffer(many.data(), 100));
 }
 
-TEST(ImageBufferTest, OnlyFormatValuesZeroToTwoAreYuv) {
+TEST(FrameDataTest, YuvFormatsByteArraysAndDefaults) {
   for (int32_t format : {0, 1, 2}) EXPECT_TRUE(OrzaVSMobile::isYUVFormat(format));
   for (int32_t format : {3, 4, 7, -1, INT32_MIN, 1000}) EXPECT_FALSE(OrzaVSMobile::isYUVFormat(format));
-}
-
-TEST(FrameDataTest, ByteArraysShareTheBytesAndDefaultsMeanUnknown) {
   uint8_t bytes[5] = {1, 2, 3, 4, 5};
   {
     OrzaVSMobile::ByteArray array(bytes, 5);
-    OrzaVSMobile::ByteArray copy(array);
+    OrzaVSMobile::ByteArray copy(array);  // shares the bytes
     copy.getData()[0] = 9;
     copy.clear();
     EXPECT_EQ(nullptr, copy.getData());
     EXPECT_EQ(5, array.getLength());
   }  // stack memory: freeing it would be reported by ASan
   EXPECT_EQ(9, bytes[0]);
-
-  OrzaVSMobile::ExtraFrameData extra;
+  const OrzaVSMobile::ExtraFrameData extra;  // -1 means unknown
   EXPECT_EQ(-1, extra.displayROI.x);
   EXPECT_EQ(-1, extra.focusROI.height);
   EXPECT_FALSE(extra.flat);

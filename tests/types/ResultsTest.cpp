@@ -28,47 +28,23 @@ static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionI
                        Tovra::CameraStabilityIssue, Tovra::JudgeVerdictOnModule, Tovra::Server::ResponseStatus,
                        OrzaVSMobile::ImageFormat, Tovra::JobState>(), "");
 
-TEST(ObjectInfoTest, DefaultsAndDeepCopies) {
-  ObjectInfo info;
+TEST(ResultsTest, DefaultsAndAMetadataClearThatEqualsAFreshOne) {
+  const ObjectInfo info, qr(Tovra::QR_CODE);
   EXPECT_EQ(6, info.srcObjectModule);
   EXPECT_EQ(11, info.contentType);
-  EXPECT_TRUE(info.content.empty() && info.properties.empty());
-  EXPECT_TRUE(info.subContents.empty() && info.location.empty());
-  ObjectInfo qr(Tovra::QR_CODE);
+  EXPECT_TRUE(info.content.empty() && info.properties.empty() && info.subContents.empty() && info.location.empty());
   EXPECT_EQ(2, qr.contentType);
   EXPECT_EQ(6, qr.srcObjectModule);
-
-  ObjectInfo grandchild(Tovra::BOUNDING_BOX_CONTENT_TYPE);
-  grandchild.content = "grandchild";
-  grandchild.location = {{5.0f, 6.0f}};
-  ObjectInfo child(Tovra::SEARCH_TERMS), source(Tovra::PIDN), target(Tovra::QR_CODE);
-  child.subContents = {grandchild};
-  source.subContents = {child};
-  target.subContents.resize(5);
-  target = source;
-  ASSERT_EQ(1u, target.subContents.size());
-  ASSERT_EQ(1u, target.subContents[0].subContents.size());
-  EXPECT_EQ("grandchild", target.subContents[0].subContents[0].content);
-  EXPECT_EQ(6.0f, target.subContents[0].subContents[0].location.at(0).y);
-  target.subContents[0].subContents[0].content = "changed";
-  target.subContents[0].subContents.push_back(ObjectInfo());
-  EXPECT_EQ("grandchild", source.subContents[0].subContents[0].content);
-  EXPECT_EQ(1u, source.subContents[0].subContents.size());
-}
-
-TEST(ResultMetadataTest, ClearMakesItEqualToAFreshOne) {
-  const ResultMetadata fresh;
   ResultMetadata metadata;
   metadata.isFinalAccumulation = true;
   metadata.queryID = "q";
   metadata.mobileDecorator = "TeskarMobileDecorator";
-  for (int i = 0; i < 10; ++i) metadata.accumulatedQueries.push_back("q" + std::to_string(i));
+  metadata.accumulatedQueries.assign(10, "q");
   metadata.clear();
   EXPECT_FALSE(metadata.isFinalAccumulation);
-  EXPECT_EQ(fresh.queryID, metadata.queryID);
-  EXPECT_EQ(fresh.mobileDecorator, metadata.mobileDecorator);
-  EXPECT_EQ(fresh.accumulatedQueries, metadata.accumulatedQueries);
-  EXPECT_TRUE(fresh.queryID.empty() && fresh.accumulatedQueries.empty());
+  EXPECT_TRUE(metadata.queryID.empty() && metadata.mobileDecorator.empty() && metadata.accumulatedQueries.empty());
+  const ResultMetadata fresh;
+  EXPECT_TRUE(!fresh.isFinalAccumulation && fresh.queryID.empty() && fresh.accumulatedQueries.empty());
 }
 
 TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {
@@ -92,27 +68,20 @@ TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {
   EXPECT_EQ("NUM_CONTENT_TYPES", Tovra::ContentTypeNames.at(static_cast<Tovra::ContentType>(12)));
 }
 
-namespace {
-
-class DecodeOnly : public Tovra::EventDelegateBase {
- public:
-  explicit DecodeOnly(bool* destroyed) : destroyed_(destroyed) {}
-  ~DecodeOnly() override { *destroyed_ = true; }
-  void didDecode(const std::vector<ObjectInfo>& objects, const ResultMetadata& metadata) override {
-    decoded.push_back(std::to_string(objects.size()) + metadata.queryID);
-  }
-  std::vector<std::string> decoded;
-
- private:
-  bool* destroyed_;
-};
-
-}  // namespace
-
+// The base absorbs every callback; a client overrides only what it wants and is destroyed
+// through a base pointer.
 TEST(EventDelegateBaseTest, BaseAbsorbsEveryCallAndAnOverrideSeesOnlyItsOwn) {
+  struct DecodeOnly : Tovra::EventDelegateBase {
+    explicit DecodeOnly(bool* flag) : destroyed(flag) {}
+    ~DecodeOnly() override { *destroyed = true; }
+    void didDecode(const std::vector<ObjectInfo>& objects, const ResultMetadata& m) override {
+      decoded.push_back(std::to_string(objects.size()) + m.queryID);
+    }
+    bool* destroyed;
+    std::vector<std::string> decoded;
+  };
   bool destroyed = false;
   std::unique_ptr<Tovra::EventDelegateBase> owner(new DecodeOnly(&destroyed));
-  auto* decodeOnly = static_cast<DecodeOnly*>(owner.get());
   Tovra::EventDelegateBase plain;
   ResultMetadata metadata;
   metadata.queryID = "q";
@@ -130,9 +99,9 @@ TEST(EventDelegateBaseTest, BaseAbsorbsEveryCallAndAnOverrideSeesOnlyItsOwn) {
     delegate->didProcessFrameDecision(static_cast<Tovra::CameraStabilityIssue>(2), 0.25);
     delegate->didProcessModuleDecision(Tovra::GIFTCARD_MOD, static_cast<Tovra::JudgeVerdictOnModule>(-3));
   }
-  EXPECT_EQ(std::vector<std::string>{"0q"}, decodeOnly->decoded);  // an empty list keeps its metadata
+  EXPECT_EQ(std::vector<std::string>{"0q"}, static_cast<DecodeOnly*>(owner.get())->decoded);
   owner.reset();
-  EXPECT_TRUE(destroyed);  // destroyed through the base pointer
+  EXPECT_TRUE(destroyed);
 }
 
 TEST(Diagnostics, DefaultSinkWritesEachLineAndANewlineToStandardOutput) {

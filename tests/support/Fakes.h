@@ -35,11 +35,7 @@ inline bool waitFor(const std::function<bool()>& done, Ms timeout = Ms(5000)) {
   return true;
 }
 
-struct ErrorCall {
-  Tovra::ObjectModuleID module;
-  Tovra::Server::ResponseStatus status;
-  int32_t code;
-};
+struct ErrorCall { Tovra::ObjectModuleID module; Tovra::Server::ResponseStatus status; int32_t code; };
 
 // Records callbacks from any thread; `decodeHook` runs first in didDecode.
 class RecordingEvents : public Tovra::EventDelegateBase {
@@ -81,6 +77,17 @@ class RecordingEvents : public Tovra::EventDelegateBase {
   std::vector<size_t> pointCounts_;
 };
 
+// A reply body with one result per content type text.
+inline std::string replyBody(const std::string& queryId, const std::vector<std::string>& types = {"PIDN"}) {
+  std::string results;
+  for (size_t i = 0; i < types.size(); ++i) {
+    results += (i ? "," : "") + std::string("{\"content\":\"c") + std::to_string(i) +
+               "\",\"contentType\":\"" + types[i] + "\",\"properties\":{}}";
+  }
+  return "{\"queryId\":\"" + queryId + "\",\"quillmark\":{\"searchResult\":[" + results +
+         "],\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[]}}}";
+}
+
 // What the transport kept of one request.
 struct SentRequest {
   std::string id;
@@ -96,10 +103,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
 
   FakeTransport() : thread_([this] { loop(); }) {}
   ~FakeTransport() override {
-    {
-      std::lock_guard<std::mutex> lock(mutex_);
-      stopping_ = true;
-    }
+    locked([this] { stopping_ = true; });
     wake_.notify_all();
     thread_.join();
   }
@@ -108,7 +112,13 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     locked([&] { responder_ = std::move(responder); });
   }
   // Answers every request with a reply whose query id is the request id.
-  void answerEverything(Ms delay = Ms(0));
+  void answerEverything(Ms delay = Ms(0)) {
+    setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {
+      reply.responseStr = replyBody(sent.id);
+      d = delay;
+      return true;
+    });
+  }
 
   // Runs synchronously inside sendServerRequestImpl, on the sender's thread.
   std::function<void(const Tovra::Server::ServerRequest&)> onSend;
@@ -143,15 +153,10 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   size_t sentCount() const { return locked([this] { return sent_.size(); }); }
   size_t pushedCount() const { return locked([this] { return pushed_; }); }
   size_t droppedCount() const { return locked([this] { return dropped_; }); }
-  bool idle() const {  // every queued reply pushed
-    return locked([this] { return queue_.empty() && !pushing_; });
-  }
+  bool idle() const { return locked([this] { return queue_.empty() && !pushing_; }); }  // all pushed
 
  private:
-  struct Scheduled {
-    Tovra::Server::ServerResponse reply;
-    Clock::time_point due;
-  };
+  struct Scheduled { Tovra::Server::ServerResponse reply; Clock::time_point due; };
   template <typename F>
   auto locked(F read) const -> decltype(read()) {
     std::lock_guard<std::mutex> lock(mutex_);
@@ -180,34 +185,14 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
 
   mutable std::mutex mutex_;
   std::condition_variable wake_;
-  bool stopping_ = false;
-  bool pushing_ = false;
+  bool stopping_ = false, pushing_ = false;
   Responder responder_;
   std::vector<SentRequest> sent_;
   std::deque<Scheduled> queue_;
-  size_t pushed_ = 0;
-  size_t dropped_ = 0;
+  size_t pushed_ = 0, dropped_ = 0;
   std::thread thread_;  // last: starts once every other member exists
 };
 
-// A reply body with one result per content type text.
-inline std::string replyBody(const std::string& queryId, const std::vector<std::string>& types = {"PIDN"}) {
-  std::string results;
-  for (size_t i = 0; i < types.size(); ++i) {
-    results += (i ? "," : "") + std::string("{\"content\":\"c") + std::to_string(i) +
-               "\",\"contentType\":\"" + types[i] + "\",\"properties\":{}}";
-  }
-  return "{\"queryId\":\"" + queryId + "\",\"quillmark\":{\"searchResult\":[" + results +
-         "],\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[]}}}";
-}
-
-inline void FakeTransport::answerEverything(Ms delay) {
-  setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {
-    reply.responseStr = replyBody(sent.id);
-    d = delay;
-    return true;
-  });
-}
 
 // A frame whose first plane has isolated bright dots on dark (many corners, sharpness > 0) or,
 // with `flat`, is uniform (no corners, sharpness 0). YUV frames get stride * height * 3 / 2

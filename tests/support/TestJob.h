@@ -14,23 +14,6 @@
 
 namespace orzavs_test {
 
-// Records, in order, the ids of the jobs that ran. Safe from any thread.
-class RunLog {
- public:
-  void add(int id) {
-    std::lock_guard<std::mutex> lock(mutex_);
-    ids_.push_back(id);
-  }
-  std::vector<int> ids() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return ids_;
-  }
-
- private:
-  mutable std::mutex mutex_;
-  std::vector<int> ids_;
-};
-
 // A one-shot gate: wait() blocks until open() (or until the timeout; returns whether it opened).
 class Gate {
  public:
@@ -56,11 +39,12 @@ class Gate {
   bool open_ = false;
 };
 
-// A job that follows the job state contract with one atomic state word, counts its runs and
+// A job that follows the job state contract with one atomic state word, counts its runs,
+// appends its id to `log` when it runs (read the log only once the workers were joined) and
 // optionally does some work (which may block, add jobs, or end AwaitingReply).
 class TestJob : public Tovra::Job {
  public:
-  explicit TestJob(int id = 0, RunLog* log = nullptr) : id_(id), log_(log) {}
+  explicit TestJob(int id = 0, std::vector<int>* log = nullptr) : id_(id), log_(log) {}
 
   void markQueued() override {
     state_.store(Tovra::Queued);
@@ -69,7 +53,7 @@ class TestJob : public Tovra::Job {
   void run() override {
     state_.store(Tovra::Running);
     runs_.fetch_add(1);
-    if (log_ != nullptr) log_->add(id_);
+    if (log_ != nullptr) log_->push_back(id_);
     if (work) work(*this);
     if (endAwaitingReply) state_.store(Tovra::AwaitingReply);
   }
@@ -99,13 +83,13 @@ class TestJob : public Tovra::Job {
 
  private:
   const int id_;
-  RunLog* log_;
+  std::vector<int>* log_;
   std::atomic<int32_t> state_{Tovra::Idle};
   std::atomic<int> runs_{0};
 };
 
 // Jobs numbered from..to (inclusive), logging into `log`.
-inline std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, RunLog* log = nullptr) {
+inline std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, std::vector<int>* log = nullptr) {
   std::vector<std::unique_ptr<TestJob>> jobs;
   for (int i = from; i <= to; ++i) jobs.emplace_back(new TestJob(i, log));
   return jobs;

@@ -4,21 +4,18 @@
 
 #include <stdexcept>
 #include <thread>
+#include <tuple>
 
 #include "support/Fakes.h"
 
-using orzavs_test::makeRequest;
-using orzavs_test::makeResponse;
-using orzavs_test::RecordingHandler;
-using orzavs_test::FakeTransport;
+using namespace orzavs_test;
 using Tovra::Server::ServerRequest;
 using Tovra::Server::ServerResponse;
 
 TEST(ServerRecordsTest, DefaultsConstructionAndClear) {
-  const ServerResponse response;
-  EXPECT_EQ(200, response.responseCode);
-  EXPECT_EQ(-1.0, response.roundtripTime);
-  EXPECT_FALSE(response.compressed);
+  const ServerResponse response;  // code 200, round trip unknown, not compressed
+  EXPECT_EQ(std::make_tuple(200, -1.0, false),
+            std::make_tuple(response.responseCode, response.roundtripTime, response.compressed));
 
   uint8_t body[3] = {1, 2, 3};
   const ServerRequest::ParamMap params = {{"a", "b"}};
@@ -29,9 +26,8 @@ TEST(ServerRecordsTest, DefaultsConstructionAndClear) {
   RecordingHandler handler;
   request.responseHandler = &handler;
   request.clear();
-  EXPECT_TRUE(request.id.empty() && request.params.empty() && request.metadata.empty());
-  EXPECT_EQ(nullptr, request.data.getData());
-  EXPECT_EQ(nullptr, request.responseHandler);
+  EXPECT_TRUE(request.id.empty() && request.params.empty() && request.metadata.empty() &&
+              request.data.getData() == nullptr && request.responseHandler == nullptr);
 }
 
 TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {

@@ -175,42 +175,6 @@ TEST(JpegEncoder, QualityIsClampedAndTablesStayBaseline) {
   EXPECT_EQ(decodeJpeg(yuvAt(100)).maxQuant, 1);
 }
 
-// What the library reads past the bottom of the picture (it encodes whole blocks), shown by
-// equivalence: a short frame gives the stream of a taller frame with as many block rows whose
-// extra rows hold what the encoder supplies, up to the height in the frame header. Luminance rows
-// repeat the last row; semi-planar chroma rows the last band does not refill keep the previous
-// band's rows (chroma row r copies row r - 8), and are mid-grey in a frame of one band.
-TEST(JpegEncoder, RowsPastTheBottomComeFromInsideThePlane) {
-  struct Case {
-    int shortH, tallH;
-    bool grey;
-  } cases[] = {{20, 24, false}, {17, 24, false}, {4, 8, true}};
-  const int w = 64, cw = 32;
-  for (ImageFormat format : {NV21, NV12}) {
-    for (const Case& c : cases) {
-      SCOPED_TRACE(label(format, w, c.shortH));
-      const Yuv420 small = makeYuv(w, c.shortH);
-      Yuv420 tall = makeYuv(w, c.tallH);
-      for (int r = 0; r < c.tallH; ++r)
-        std::copy_n(&small.y[std::min(r, c.shortH - 1) * w], w, &tall.y[r * w]);
-      for (int i = 0; i < tall.ch() * cw; ++i) {
-        const int r = i / cw, from = (r < small.ch() ? r : r - 8) * cw + i % cw;
-        const bool grey = r >= small.ch() && c.grey;
-        tall.u[i] = grey ? 0x80 : small.u[from];
-        tall.v[i] = grey ? 0x80 : small.v[from];
-      }
-      const std::vector<uint8_t> a = yuvJpeg(packYuv(small, format), w, c.shortH, format);
-      std::vector<uint8_t> b = yuvJpeg(packYuv(tall, format), w, c.tallH, format);
-      ASSERT_EQ(a.size(), b.size());
-      size_t sof = 0;  // FF C0, length (2), precision (1), height (2, big-endian)
-      while (sof + 6 < b.size() && !(b[sof] == 0xFF && b[sof + 1] == 0xC0)) ++sof;
-      ASSERT_EQ(b[sof + 6], c.tallH);
-      b[sof + 6] = static_cast<uint8_t>(c.shortH);
-      EXPECT_EQ(a, b);
-    }
-  }
-}
-
 TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAreAccepted) {
   const std::vector<uint8_t> frame(64 * 64 * 4, 0x80);
   std::vector<uint8_t> out, work;

@@ -51,19 +51,12 @@ inline int score(const uint8_t* plane, int stride, int x, int y, int b) {
   int low = b, high = 255;
   do {
     const int t = (low + high) / 2;
-    if (isCorner(plane, stride, x, y, t)) {
-      low = t;
-    } else {
-      high = t;
-    }
+    (isCorner(plane, stride, x, y, t) ? low : high) = t;
   } while (!(low == high - 1 || low == high));
   return low;
 }
 
-struct Detection {
-  std::vector<Fast9Corner> corners;
-  std::vector<int> scores;
-};
+struct Detection { std::vector<Fast9Corner> corners; std::vector<int> scores; };
 
 inline Detection detect(const uint8_t* plane, int width, int height, int stride, int b) {
   Detection d;
@@ -88,9 +81,8 @@ inline Detection suppress(const Detection& raw) {
     bool dominated = false;
     for (int dy = -1; dy <= 1; ++dy) {
       for (int dx = -1; dx <= 1; ++dx) {
-        if (dx == 0 && dy == 0) continue;
-        auto it = grid.find({c.x + dx, c.y + dy});
-        if (it != grid.end() && it->second >= raw.scores[i]) dominated = true;
+        const auto it = grid.find({c.x + dx, c.y + dy});
+        dominated |= (dx != 0 || dy != 0) && it != grid.end() && it->second >= raw.scores[i];
       }
     }
     if (!dominated) {

@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <chrono>
 #include <memory>
 #include <thread>
 #include <vector>
@@ -10,23 +9,8 @@
 #include "support/StdoutCapture.h"
 #include "support/TestJob.h"
 
-using orzavs_test::Gate;
-using orzavs_test::makeJobs;
-using orzavs_test::StdoutCapture;
-using orzavs_test::TestJob;
+using namespace orzavs_test;
 using Tovra::TovraExecutionEngine;
-
-namespace {
-
-// Makes `job` open `started` when it runs, then hold its worker until `release` opens.
-void blockOnRun(TestJob& job, Gate& started, Gate& release) {
-  job.work = [&](TestJob&) {
-    started.open();
-    release.wait();
-  };
-}
-
-}  // namespace
 
 TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButAwaitingOnes) {
   std::vector<int> log;  // read once the worker was joined
@@ -65,20 +49,20 @@ TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
     TovraExecutionEngine engine(0);
     EXPECT_EQ("Initialized TovraExecutionEngine with invalid number of threads\n", out.text());
     engine.addJob(&job);
-    std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    std::this_thread::sleep_for(Ms(20));
   }
   EXPECT_EQ(Tovra::Queued, job.state());  // destruction discards the queue without settling it
   EXPECT_EQ(0, job.runs());
 }
 
 TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResumed) {
-  Gate started, release;
+  Gate release;
   TestJob blocker(0);
-  blockOnRun(blocker, started, release);
+  blocker.work = [&](TestJob&) { release.wait(); };
   std::vector<std::unique_ptr<TestJob>> waiting = makeJobs(1, 3);
   TovraExecutionEngine engine(1);
   engine.addJob(&blocker);
-  ASSERT_TRUE(started.wait());
+  ASSERT_TRUE(blocker.waitForState(Tovra::Running));
   for (auto& job : waiting) engine.addJob(job.get());
   engine.cancelJobs();
   TestJob refused(4);
@@ -112,16 +96,16 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
 }
 
 TEST(TovraExecutionEngineTest, DestructionSettlesQueuedJobsAndJoins) {
-  Gate started, release;
+  Gate release;
   TestJob running(0);
-  blockOnRun(running, started, release);
+  running.work = [&](TestJob&) { release.wait(); };
   std::vector<std::unique_ptr<TestJob>> queued = makeJobs(1, 4);
   auto engine = std::make_unique<TovraExecutionEngine>(1);
   engine->addJob(&running);
-  ASSERT_TRUE(started.wait());
+  ASSERT_TRUE(running.waitForState(Tovra::Running));
   for (auto& job : queued) engine->addJob(job.get());
   std::thread releaser([&] {
-    std::this_thread::sleep_for(std::chrono::milliseconds(30));
+    std::this_thread::sleep_for(Ms(30));
     release.open();
   });
   engine.reset();  // returns only once the worker drained the queue and was joined

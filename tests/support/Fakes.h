@@ -17,23 +17,12 @@
 #include <vector>
 
 #include "engine/TovraStateEngine.h"
+#include "support/Wait.h"
 #include "server/ServerDelegate.h"
 #include "types/EventDelegateBase.h"
 #include "types/ImageFormat.h"
 
 namespace orzavs_test {
-
-using Clock = std::chrono::steady_clock;
-using Ms = std::chrono::milliseconds;
-
-inline bool waitFor(const std::function<bool()>& done, Ms timeout = Ms(5000)) {
-  const auto end = Clock::now() + timeout;
-  while (!done()) {
-    if (Clock::now() > end) return false;
-    std::this_thread::sleep_for(Ms(1));
-  }
-  return true;
-}
 
 struct ErrorCall { Tovra::ObjectModuleID module; Tovra::Server::ResponseStatus status; int32_t code; };
 

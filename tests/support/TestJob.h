@@ -2,42 +2,14 @@
 #define ORZAVS_TESTS_SUPPORT_TESTJOB_H
 
 #include <atomic>
-#include <chrono>
-#include <condition_variable>
 #include <functional>
 #include <memory>
-#include <mutex>
-#include <thread>
 #include <vector>
 
 #include "exec/Job.h"
+#include "support/Wait.h"
 
 namespace orzavs_test {
-
-// A one-shot gate: wait() blocks until open() (or until the timeout; returns whether it opened).
-class Gate {
- public:
-  void open() {
-    {
-      std::lock_guard<std::mutex> lock(mutex_);
-      open_ = true;
-    }
-    cv_.notify_all();
-  }
-  bool wait(std::chrono::milliseconds timeout = std::chrono::seconds(10)) {
-    std::unique_lock<std::mutex> lock(mutex_);
-    return cv_.wait_for(lock, timeout, [this] { return open_; });
-  }
-  bool isOpen() const {
-    std::lock_guard<std::mutex> lock(mutex_);
-    return open_;
-  }
-
- private:
-  mutable std::mutex mutex_;
-  std::condition_variable cv_;
-  bool open_ = false;
-};
 
 // A job that follows the job state contract with one atomic state word, counts its runs,
 // appends its id to `log` when it runs (read the log only once the workers were joined) and
@@ -61,14 +33,9 @@ class TestJob : public Tovra::Job {
     if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
   }
 
-  // Polls every millisecond until the state is `wanted`; false after the timeout.
-  bool waitForState(int32_t wanted, std::chrono::milliseconds timeout = std::chrono::seconds(10)) {
-    const auto deadline = std::chrono::steady_clock::now() + timeout;
-    while (state_.load() != wanted) {
-      if (std::chrono::steady_clock::now() >= deadline) return false;
-      std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    }
-    return true;
+  // Polls until the state is `wanted`; false after the timeout.
+  bool waitForState(int32_t wanted, Ms timeout = Ms(10000)) {
+    return waitFor([&] { return state_.load() == wanted; }, timeout);
   }
 
   int32_t state() const { return state_.load(); }

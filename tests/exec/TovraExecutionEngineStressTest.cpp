@@ -10,7 +10,7 @@
 #include "support/TestJob.h"
 
 using namespace orzavs_test;
-using microseconds;
+using std::chrono::microseconds;
 using Tovra::TovraExecutionEngine;
 
 // Several producers add jobs to a multi-worker engine while another thread keeps cancelling

@@ -1,13 +1,9 @@
-// Handles: native addresses crossing JNI as jlong. On 32-bit Android much of the heap lies in the
-// upper half of the address space, where an address has its top bit set, so any path that turns a
-// pointer into a jlong by a plain cast (which GCC and clang sign-extend) would hand Java a
-// negative handle that names nothing. Besides the conversion itself, the exported functions
-// create, read, change, return and destroy objects placed there.
-//
-// Placement: while a test holds a HighHeapScope, this binary's operator new serves its thread
-// from an arena mapped at a hinted address above 2 GiB. On a 32-bit target the test requires the
-// arena to be there (and skips, saying so, if the system will not map it); on a 64-bit host the
-// arena lies wherever the system put it and the same round trips are checked.
+// Handles: native addresses crossing JNI as jlong. 32-bit Android keeps much of its heap above
+// 2 GiB, where a plain (sign-extending) cast would give Java a negative handle naming nothing.
+// While a test holds a HighHeapScope, this binary's operator new serves its thread from an arena
+// mapped at a hinted address above 2 GiB, so the exported functions create, read, change, return
+// and destroy objects there. A 32-bit target requires the arena up there (the test skips, saying
+// so, if the system will not map it); a 64-bit host checks the same round trips wherever it lies.
 
 #include <jni.h>
 #include <sys/mman.h>

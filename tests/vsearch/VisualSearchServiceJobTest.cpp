@@ -13,20 +13,20 @@
 
 namespace {
 
-using orzavs_test::replyBody;
+using namespace orzavs_test;
 using Tovra::FrameRecord;
-using orzavs_test::makeResponse;
 
-std::shared_ptr<FrameRecord> makeRecord(int w, int h, int format, int orient = 0, uint64_t frameId = 7) {
+// Frame 7: textured pixels of `format`, packed ones with 3 bytes a pixel.
+std::shared_ptr<FrameRecord> makeRecord(int w, int h, int format, int orient = 0) {
   auto r = std::make_shared<FrameRecord>();
-  r->frameId = frameId;
+  r->frameId = 7;
   r->width = w;
   r->height = h;
   r->numChannels = OrzaVSMobile::isYUVFormat(format) || format == OrzaVSMobile::GRAY ? 0 : 3;
   r->widthStep = r->numChannels ? w * 3 : w;
   r->format = format;
   r->screenOrient = orient;
-  r->pixels = orzavs_test::makeFrame(r->widthStep, h, r->widthStep, format);
+  r->pixels = makeFrame(r->widthStep, h, r->widthStep, format);
   return r;
 }
 
@@ -46,20 +46,19 @@ class JobTest : public ::testing::Test {
     return transport.sent().back().id;
   }
   std::string sendGray(int orient = 0) { return send(makeRecord(32, 32, OrzaVSMobile::GRAY, orient)); }
-  orzavs_test::RecordingEvents events;
-  orzavs_test::FakeTransport transport;
+  RecordingEvents events;
+  FakeTransport transport;
   std::unique_ptr<Tovra::VisualSearchServiceJob> job;  // destroyed before the transport
 };
 
 TEST_F(JobTest, SendsADecodableJpegAndLetsGoOfTheFrame) {
   for (int format : {OrzaVSMobile::NV21, OrzaVSMobile::GRAY, OrzaVSMobile::RGB}) {
-    auto record = makeRecord(40, 24, format, 0, 7);
+    auto record = makeRecord(40, 24, format);
     const std::string id = send(record);
     EXPECT_EQ(record.use_count(), 1);
     EXPECT_TRUE(std::regex_match(id, std::regex("TovraStateEngine-[0-9]+-7")));
-    const orzavs_test::SentRequest sent = transport.sent().back();
-    EXPECT_EQ(sent.metadata.at("width"), "40");
-    EXPECT_EQ(sent.metadata.at("height"), "24");
+    const SentRequest sent = transport.sent().back();
+    EXPECT_EQ(sent.metadata.at("width") + "x" + sent.metadata.at("height"), "40x24");
     const jpeg_test::Decoded decoded = jpeg_test::decodeJpeg(sent.body);
     EXPECT_TRUE(decoded.ok && decoded.width == 40 && decoded.height == 24) << format;
     EXPECT_EQ(decoded.components, format == OrzaVSMobile::GRAY ? 1 : 3);
@@ -87,7 +86,7 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
   shortYuv->pixels.resize(32 * 32);
   auto shortPacked = makeRecord(32, 32, OrzaVSMobile::BGRA);
   shortPacked->numChannels = 4;
-  orzavs_test::StdoutCapture printed;
+  StdoutCapture printed;
   for (const auto& bad : {shortYuv, shortPacked}) {
     job->setFrameRecord(bad);
     job->run();
@@ -104,7 +103,7 @@ TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
       {404, "not found", Tovra::Server::RESPONSE_SERVER_ERROR},
       {200, "{\"queryId\":", Tovra::Server::RESPONSE_PARSE_ERROR},
       {201, "{}", Tovra::Server::RESPONSE_SERVER_ERROR}};  // only 200 is success
-  orzavs_test::StdoutCapture printed;
+  StdoutCapture printed;
   std::string lines;
   for (const auto& f : failures) {
     transport.pushServerResponse(makeResponse(sendGray(), f.body, f.code));

@@ -1,7 +1,6 @@
 #ifndef ORZAVS_TESTS_SUPPORT_STDOUTCAPTURE_H
 #define ORZAVS_TESTS_SUPPORT_STDOUTCAPTURE_H
 
-#include <algorithm>
 #include <string>
 
 #include "types/Diagnostics.h"
@@ -34,17 +33,6 @@ class StdoutCapture {
   bool active_ = true;
   std::string text_;
 };
-
-// Number of times `line` (without its newline) occurs as a whole line of `text`.
-inline int countLines(const std::string& text, const std::string& line) {
-  int count = 0;
-  for (size_t start = 0; start < text.size();) {
-    const size_t end = std::min(text.find('\n', start), text.size());
-    count += text.compare(start, end - start, line) == 0 ? 1 : 0;
-    start = end + 1;
-  }
-  return count;
-}
 
 }  // namespace orzavs_test
 

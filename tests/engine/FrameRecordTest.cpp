@@ -4,6 +4,7 @@
 
 #include <memory>
 #include <numeric>
+#include <tuple>
 #include <vector>
 
 #include "engine/FrameRecordManager.h"
@@ -99,10 +100,8 @@ TEST(FrameRecordTest, LentBuffersRoundRowsFirstAndAreTakenWithoutACopy) {
   ASSERT_TRUE(record.setSourceImage(even, extra));
   EXPECT_EQ(storage, record.pixels.data());
   EXPECT_EQ(frame, record.pixels);
-  EXPECT_EQ(80, record.widthStep);
-  EXPECT_EQ(OrzaVSMobile::I420, record.format);
-  EXPECT_EQ(90, record.screenOrient);
-  EXPECT_EQ(1, record.flat);
+  EXPECT_EQ(std::make_tuple(80, int{OrzaVSMobile::I420}, 90, 1),
+            std::make_tuple(record.widthStep, record.format, record.screenOrient, record.flat));
 
   ImageBuffer grey = geometry(OrzaVSMobile::GRAY, 10, 7, 12);
   ASSERT_EQ(50, grey.allocateBuffer(50));  // its own block is freed normally (LeakSanitizer)
@@ -120,8 +119,7 @@ TEST(FrameRecordTest, LendingRefusesBadGeometryAndBoundsTheFill) {
     buffer.data = previous;  // whatever the buffer pointed at before is dropped
     buffer.allocLen = 5;
     EXPECT_FALSE(record.lendBuffer(buffer));
-    EXPECT_EQ(nullptr, buffer.data);
-    EXPECT_EQ(0, buffer.allocLen);
+    EXPECT_TRUE(buffer.data == nullptr && buffer.allocLen == 0);
   }
   ImageBuffer buffer = geometry(OrzaVSMobile::GRAY, 4, 4, 4);
   ASSERT_TRUE(record.lendBuffer(buffer));
@@ -134,11 +132,7 @@ TEST(FrameRecordTest, LendingRefusesBadGeometryAndBoundsTheFill) {
 TEST(FrameRecordTest, CopiesSourcesThatHoldTheirGeometryAndRefusesTheRest) {
   FrameRecord record;
   const ExtraFrameData extra;
-  struct Case {
-    OrzaVSMobile::ImageFormat format;
-    int width, height, stride;
-    size_t bytes;
-  };
+  struct Case { OrzaVSMobile::ImageFormat format; int width, height, stride; size_t bytes; };
   // YUV frames take widthStep * height * 3 / 2 bytes, every other layout widthStep * height.
   for (const Case& c : {Case{OrzaVSMobile::NV21, 16, 12, 16, 288}, Case{OrzaVSMobile::GRAY, 10, 5, 10, 50},
                         Case{OrzaVSMobile::RGB, 10, 4, 30, 120}}) {

@@ -21,12 +21,10 @@ using Tovra::ResultMetadata;
 // Every enumeration that crosses JNI has a fixed 32-bit underlying type, so any integer that
 // arrives from Java is a valid value of the type.
 template <typename... E>
-constexpr bool allInt32() {
-  return (std::is_same<typename std::underlying_type<E>::type, int32_t>::value && ...);
-}
+constexpr bool allInt32 = (std::is_same<typename std::underlying_type<E>::type, int32_t>::value && ...);
 static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionID, Tovra::StatusID,
                        Tovra::CameraStabilityIssue, Tovra::JudgeVerdictOnModule, Tovra::Server::ResponseStatus,
-                       OrzaVSMobile::ImageFormat, Tovra::JobState>(), "");
+                       OrzaVSMobile::ImageFormat, Tovra::JobState>, "");
 
 TEST(ResultsTest, DefaultsAndAMetadataClearThatEqualsAFreshOne) {
   const ObjectInfo info, qr(Tovra::QR_CODE);

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <numeric>
+#include <tuple>
 #include <vector>
 
 #include "types/ByteArray.h"
@@ -43,10 +44,8 @@ TEST(ImageBufferTest, DefaultAndBorrowingBuffersCannotBeFilled) {
   const std::vector<uint8_t> before = pixels;
   {
     ImageBuffer borrowed(5, OrzaVSMobile::GRAY, 8, 6, 10, 1, pixels.data());  // definition first
-    EXPECT_EQ(5, borrowed.definition);
-    EXPECT_EQ(OrzaVSMobile::GRAY, borrowed.format);
-    EXPECT_EQ(10, borrowed.widthStep);
-    EXPECT_EQ(-1, borrowed.knownLength());
+    EXPECT_EQ(std::make_tuple(5, OrzaVSMobile::GRAY, 10, int64_t{-1}),
+              std::make_tuple(borrowed.definition, borrowed.format, borrowed.widthStep, borrowed.knownLength()));
     expectEveryFillCopiesNothing(borrowed, 32);
     borrowed.releaseBuffer();  // frees nothing (ASan would report a bad free)
     EXPECT_EQ(pixels.data(), borrowed.data);
@@ -194,9 +193,6 @@ TEST(FrameDataTest, YuvFormatsByteArraysAndDefaults) {
   }  // stack memory: freeing it would be reported by ASan
   EXPECT_EQ(9, bytes[0]);
   const OrzaVSMobile::ExtraFrameData extra;  // -1 means unknown
-  EXPECT_EQ(-1, extra.displayROI.x);
-  EXPECT_EQ(-1, extra.focusROI.height);
-  EXPECT_FALSE(extra.flat);
-  EXPECT_EQ(0, extra.screenOrient);
-  EXPECT_EQ(-1.0, extra.timeStamp);
+  EXPECT_EQ(std::make_tuple(-1, -1, false, 0, -1.0),
+            std::make_tuple(extra.displayROI.x, extra.focusROI.height, extra.flat, extra.screenOrient, extra.timeStamp));
 }

@@ -100,10 +100,9 @@ TEST(VisualSearchResponseParser, ReadsResultsMetadataBoxesAndNesting) {
                                 result("DirectedResult", "{}", ",\"subContent\":[" + result("Nope", "null") + "]") + "]") +
                          R"(],"resultMetadata":{"finalAccumulation":true,"accumulatedQueries":["Q-0","Q-00"]}}})");
   ASSERT_TRUE(p.ok);
-  EXPECT_EQ(p.metadata.queryID, "Q-1");
-  EXPECT_TRUE(p.metadata.isFinalAccumulation);
+  EXPECT_EQ(std::make_tuple(std::string("Q-1"), true, std::string("TeskarMobileDecorator")),
+            std::make_tuple(p.metadata.queryID, p.metadata.isFinalAccumulation, p.metadata.mobileDecorator));
   EXPECT_EQ(p.metadata.accumulatedQueries, (std::vector<std::string>{"Q-0", "Q-00"}));
-  EXPECT_EQ(p.metadata.mobileDecorator, "TeskarMobileDecorator");
   ASSERT_EQ(p.results.size(), 3u);
   EXPECT_EQ(p.results[0].contentType, Tovra::PIDN);
   EXPECT_EQ(p.results[0].properties, "{\"score\":1}");
@@ -111,12 +110,9 @@ TEST(VisualSearchResponseParser, ReadsResultsMetadataBoxesAndNesting) {
   // The box: four corners top-left, top-right, bottom-right, bottom-left; properties keep it.
   const ObjectInfo& box = p.results[1];
   EXPECT_EQ(static_cast<int>(box.contentType), 10);
-  ASSERT_EQ(box.location.size(), 4u);
-  const float expected[8] = {1, 2, 3.5f, 4, 5, 6, 7, 8.25f};
-  for (int i = 0; i < 4; ++i) {
-    EXPECT_EQ(box.location[i].x, expected[2 * i]);
-    EXPECT_EQ(box.location[i].y, expected[2 * i + 1]);
-  }
+  std::vector<float> corners;
+  for (const auto& corner : box.location) corners.insert(corners.end(), {corner.x, corner.y});
+  EXPECT_EQ(corners, (std::vector<float>{1, 2, 3.5f, 4, 5, 6, 7, 8.25f}));
   EXPECT_EQ(box.properties,
             "{\"boundingBox\":{\"blx\":7,\"bly\":8.25,\"brx\":5,\"bry\":6,\"tlx\":1,\"tly\":2,\"trx\":3.5,\"try\":4}}");
   EXPECT_EQ(p.results[2].properties, "\"plain\"");
@@ -124,9 +120,9 @@ TEST(VisualSearchResponseParser, ReadsResultsMetadataBoxesAndNesting) {
   const ObjectInfo& mid = p.results[2].subContents[0];
   EXPECT_EQ(mid.contentType, Tovra::DIRECTED_RESULT);
   ASSERT_EQ(mid.subContents.size(), 1u);
-  EXPECT_EQ(mid.subContents[0].contentType, Tovra::UNSPECIFIED_CONTENT_TYPE);
-  EXPECT_EQ(mid.subContents[0].properties, "null");
-  EXPECT_EQ(mid.subContents[0].srcObjectModule, Tovra::UNSPECIFIED_OBJECT_MOD);
+  const ObjectInfo& leaf = mid.subContents[0];
+  EXPECT_EQ(std::make_tuple(Tovra::UNSPECIFIED_CONTENT_TYPE, std::string("null"), Tovra::UNSPECIFIED_OBJECT_MOD),
+            std::make_tuple(leaf.contentType, leaf.properties, leaf.srcObjectModule));
 }
 
 TEST(VisualSearchResponseParser, TypeTextsAreMatchedWholeAndListsMayBeEmptyObjectsOrAbsent) {

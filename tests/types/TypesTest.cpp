@@ -1,14 +1,26 @@
+// The value types: image buffers and their ownership rules, frame data, results, names, the
+// diagnostic output.
+
 #include "types/ImageBuffer.h"
 
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <map>
 #include <numeric>
+#include <string>
 #include <tuple>
+#include <type_traits>
 #include <vector>
 
+#include "exec/Job.h"
+#include "exec/TovraExecutionEngine.h"
 #include "types/ByteArray.h"
+#include "types/DiagnosticOutput.h"
+#include "types/EnumNames.h"
 #include "types/FrameData.h"
+#include "types/ObjectInfo.h"
+#include "types/ResultMetadata.h"
 
 using OrzaVSMobile::ImageBuffer;
 
@@ -195,4 +207,62 @@ TEST(FrameDataTest, YuvFormatsByteArraysAndDefaults) {
   const OrzaVSMobile::ExtraFrameData extra;  // -1 means unknown
   EXPECT_EQ(std::make_tuple(-1, -1, false, 0, -1.0),
             std::make_tuple(extra.displayROI.x, extra.focusROI.height, extra.flat, extra.screenOrient, extra.timeStamp));
+}
+
+using Tovra::ObjectInfo;
+using Tovra::ResultMetadata;
+
+// Every enumeration that crosses JNI has a fixed 32-bit underlying type, so any integer that
+// arrives from Java is a valid value of the type.
+template <typename... E>
+constexpr bool allInt32 = (std::is_same<typename std::underlying_type<E>::type, int32_t>::value && ...);
+static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionID, Tovra::StatusID,
+                       Tovra::CameraStabilityIssue, Tovra::JudgeVerdictOnModule, Tovra::Server::ResponseStatus,
+                       OrzaVSMobile::ImageFormat, Tovra::JobState>, "");
+
+TEST(ResultsTest, DefaultsAndAMetadataClearThatEqualsAFreshOne) {
+  const ObjectInfo info, qr(Tovra::QR_CODE);
+  EXPECT_EQ(6, info.srcObjectModule);
+  EXPECT_EQ(11, info.contentType);
+  EXPECT_TRUE(info.content.empty() && info.properties.empty() && info.subContents.empty() && info.location.empty());
+  EXPECT_EQ(2, qr.contentType);
+  EXPECT_EQ(6, qr.srcObjectModule);
+  ResultMetadata metadata;
+  metadata.isFinalAccumulation = true;
+  metadata.queryID = "q";
+  metadata.mobileDecorator = "TeskarMobileDecorator";
+  metadata.accumulatedQueries.assign(10, "q");
+  metadata.clear();
+  EXPECT_FALSE(metadata.isFinalAccumulation);
+  EXPECT_TRUE(metadata.queryID.empty() && metadata.mobileDecorator.empty() && metadata.accumulatedQueries.empty());
+  const ResultMetadata fresh;
+  EXPECT_TRUE(!fresh.isFinalAccumulation && fresh.queryID.empty() && fresh.accumulatedQueries.empty());
+}
+
+TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {
+#define ORZAVS_NAMED(e) {Tovra::e, #e}
+  const std::map<Tovra::ObjectModuleID, std::string> modules = {
+      ORZAVS_NAMED(BARCODE_MOD), ORZAVS_NAMED(VISUAL_SEARCH_SERVICE_MOD), ORZAVS_NAMED(TWOD_BARCODE_MOD),
+      ORZAVS_NAMED(PACKAGE_LABEL_MOD), ORZAVS_NAMED(GIFTCARD_MOD), ORZAVS_NAMED(UNSPECIFIED_OBJECT_MOD),
+      ORZAVS_NAMED(NUM_OBJECT_MODS)};
+  const std::map<Tovra::ContentType, std::string> contents = {
+      ORZAVS_NAMED(BARCODE_UPC_EAN), ORZAVS_NAMED(BARCODE_128), ORZAVS_NAMED(QR_CODE), ORZAVS_NAMED(DATA_MATRIX),
+      ORZAVS_NAMED(PDF_417), ORZAVS_NAMED(GIFT_CARD), ORZAVS_NAMED(PIDN), ORZAVS_NAMED(SEARCH_TERMS),
+      ORZAVS_NAMED(DIRECTED_RESULT), ORZAVS_NAMED(EXTERNAL_RESULT), ORZAVS_NAMED(UNSPECIFIED_CONTENT_TYPE),
+      ORZAVS_NAMED(NUM_CONTENT_TYPES)};
+#undef ORZAVS_NAMED
+  EXPECT_EQ(modules, Tovra::ObjectModuleIDNames);
+  EXPECT_EQ(contents, Tovra::ContentTypeNames);
+}
+
+TEST(Diagnostics, DefaultSinkWritesEachLineAndANewlineToStandardOutput) {
+  const std::string reply(300, 'x');  // past the formatting buffer of short lines
+  testing::internal::CaptureStdout();
+  Tovra::TovraExecutionEngine none(0);
+  OrzaVSMobile::reportLinef("VSS SERVER ERROR: response: %s", reply.c_str());
+  OrzaVSMobile::reportLinef("Skipped input frame: invalid image size %dx%d", -1, 0);
+  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+            "Initialized TovraExecutionEngine with invalid number of threads\n"
+            "VSS SERVER ERROR: response: " + reply + "\n"
+            "Skipped input frame: invalid image size -1x0\n");
 }

@@ -10,7 +10,7 @@
 #include "Fast9Reference.h"
 #include "features/Fast9.h"
 #include "features/InterestPoints.h"
-#include "support/ThreadsAgree.h"
+#include "support/Threads.h"
 
 namespace {
 

@@ -19,7 +19,7 @@
 #include <gtest/gtest.h>
 
 #include "engine/TovraStateEngine.h"
-#include "support/Wait.h"
+#include "support/Threads.h"
 #include "server/ServerDelegate.h"
 #include "types/EventDelegateBase.h"
 #include "types/ImageFormat.h"

@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "exec/Job.h"
-#include "support/Wait.h"
+#include "support/Threads.h"
 
 namespace orzavs_test {
 

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "support/ThreadsAgree.h"
+#include "support/Threads.h"
 #include "tests/vsearch/JpegTestSupport.h"
 #include "vsearch/JpegEncoder.h"
 

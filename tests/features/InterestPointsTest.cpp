@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdlib>
 #include <numeric>
 #include <ostream>
 #include <random>
@@ -109,58 +110,45 @@ TEST(Fast9Test, ComparisonsAreStrictAndNeedNineContiguousPixels) {
     }
     return p;
   };
-  for (int polarity : {1, -1}) {
-    for (int d : {50, 51, 52}) {
-      const std::vector<uint8_t> p = arc(5, 9, 100 + polarity * d);
-      const Result r = detect(p.data(), 9, 9, 9, 50, Fast9Path::Best);
-      EXPECT_EQ(r.corners, detect(p.data(), 9, 9, 9, 50, Fast9Path::Scalar).corners);
-      if (d == 50) {
-        EXPECT_TRUE(r.corners.empty()) << "difference equal to the threshold is no corner";
-      } else {
-        ASSERT_EQ(r.corners, (std::vector<Fast9Corner>{{4, 4}}));
-        EXPECT_EQ(r.scores[0], d - 1);  // highest t with d > t
-      }
-    }
+  for (int d : {50, 51, 52, -50, -51, -52}) {  // brighter or darker by d; the threshold is 50
+    const std::vector<uint8_t> p = arc(5, 9, 100 + d);
+    expectAgreement(p.data(), 9, 9, 9, 50, true);
+    // A difference equal to the threshold is no corner; the score is the highest t with |d| > t.
+    EXPECT_EQ(detect(p.data(), 9, 9, 9, 50, Fast9Path::Best).scores,
+              std::abs(d) == 50 ? std::vector<int>() : std::vector<int>{std::abs(d) - 1}) << d;
   }
   // Eight contiguous pixels are not enough; the ninth may sit across the wrap from 15 to 0.
   EXPECT_TRUE(detect(arc(12, 8, 250).data(), 9, 9, 9, 10, Fast9Path::Best).corners.empty());
   EXPECT_EQ(detect(arc(12, 9, 250).data(), 9, 9, 9, 10, Fast9Path::Best).corners.size(), 1u);
 }
 
-TEST(Fast9Test, UniformPlaneAndBorders) {
+TEST(Fast9Test, UniformPlaneBordersAndEqualNeighbours) {
   const int w = 40, h = 30;
-  std::vector<uint8_t> flat(static_cast<size_t>(w) * h, 77);
   // Dots right at the tested band's edge are found; one pixel further out they are not.
-  const std::vector<std::array<int, 3>> inside = {{3, 3, 200}, {w - 4, 3, 200}, {3, h - 4, 200}, {w - 4, h - 4, 200}};
-  const std::vector<uint8_t> in = dotPlane(w, h, inside);
-  const std::vector<uint8_t> out = dotPlane(w, h, {{2, 10, 200}, {w - 3, 10, 200}, {10, 2, 200}, {20, h - 3, 200}});
-  for (Fast9Path path : kPaths) {
-    EXPECT_TRUE(detect(flat.data(), w, h, w, 0, path).corners.empty());
-    const Result r = detect(in.data(), w, h, w, 50, path, true);
-    ASSERT_EQ(r.corners.size(), 4u);
-    for (size_t i = 0; i < 4; ++i) EXPECT_EQ(r.corners[i], (Fast9Corner{inside[i][0], inside[i][1]}));
-    EXPECT_TRUE(detect(out.data(), w, h, w, 50, path).corners.empty());
-  }
-}
-
-TEST(Fast9Test, EqualNeighboursSuppressEachOther) {
-  const int w = 30, h = 30;
-  // Two-pixel blobs: each pixel sees only background on its circle, so its score is value-1.
-  const struct { int dx, dy, second; size_t kept; } cases[] = {
-      {1, 0, 200, 0}, {0, 1, 200, 0}, {1, 1, 200, 0}, {-1, 1, 200, 0}, {1, 0, 201, 1}, {0, 1, 199, 1}, {1, 1, 150, 1}};
-  for (const auto& c : cases) {
+  const std::vector<uint8_t> flat(static_cast<size_t>(w) * h, 77),
+      in = dotPlane(w, h, {{3, 3, 200}, {w - 4, 3, 200}, {3, h - 4, 200}, {w - 4, h - 4, 200}}),
+      out = dotPlane(w, h, {{2, 10, 200}, {w - 3, 10, 200}, {10, 2, 200}, {20, h - 3, 200}});
+  expectAgreement(flat.data(), w, h, w, 0, true);
+  expectAgreement(in.data(), w, h, w, 50, true);
+  expectAgreement(out.data(), w, h, w, 50, true);
+  EXPECT_TRUE(detect(flat.data(), w, h, w, 0, Fast9Path::Best).corners.empty());
+  EXPECT_EQ(detect(in.data(), w, h, w, 50, Fast9Path::Best, true).corners,
+            (std::vector<Fast9Corner>{{3, 3}, {w - 4, 3}, {3, h - 4}, {w - 4, h - 4}}));
+  EXPECT_TRUE(detect(out.data(), w, h, w, 50, Fast9Path::Best).corners.empty());
+  // Two-pixel blobs: each pixel sees only background on its circle, so its score is value-1; of
+  // two neighbours with equal scores neither is kept, else the stronger one.
+  const struct { int dx, dy, second; } blobs[] = {
+      {1, 0, 200}, {0, 1, 200}, {1, 1, 200}, {-1, 1, 200}, {1, 0, 201}, {0, 1, 199}, {1, 1, 150}};
+  for (const auto& c : blobs) {
     SCOPED_TRACE(std::to_string(c.dx) + "," + std::to_string(c.dy) + " second " + std::to_string(c.second));
     const std::vector<uint8_t> p = dotPlane(w, h, {{14, 14, 200}, {14 + c.dx, 14 + c.dy, c.second}});
-    for (Fast9Path path : kPaths) {
-      EXPECT_EQ(detect(p.data(), w, h, w, 50, path).corners.size(), 2u);
-      const Result k = detect(p.data(), w, h, w, 50, path, true);
-      ASSERT_EQ(k.corners.size(), c.kept);
-      if (c.kept == 1) {
-        const bool firstWins = c.second < 200;
-        EXPECT_EQ(k.corners[0], firstWins ? (Fast9Corner{14, 14}) : (Fast9Corner{14 + c.dx, 14 + c.dy}));
-        EXPECT_EQ(k.scores[0], std::max(200, c.second) - 1);
-      }
-    }
+    expectAgreement(p.data(), w, h, w, 50, true);
+    const Result kept = detect(p.data(), w, h, w, 50, Fast9Path::Best, true);
+    const Result expected = c.second == 200 ? Result{}
+                            : c.second < 200 ? Result{{{14, 14}}, {199}}
+                                             : Result{{{14 + c.dx, 14 + c.dy}}, {c.second - 1}};
+    EXPECT_EQ(kept.corners, expected.corners);
+    EXPECT_EQ(kept.scores, expected.scores);
   }
 }
 

@@ -111,7 +111,19 @@ TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
   EXPECT_EQ(engine->job(0).state(), Tovra::Finished);
   // The lent buffer outlived the reset that dropped its record: a late fill is harmless.
   EXPECT_EQ(lent.fillBuffer(textured.data(), kW * kH), kW * kH);
-
+  // Paused: the defined lines, nothing lent, nothing processed.
+  orzavs_test::StdoutCapture printed;
+  ImageBuffer refused = lendable(OrzaVSMobile::GRAY), plain = image();
+  std::string refusedKey = "kept";
+  engine->requestImageBuffer(refused, refusedKey);
+  ExtraFrameData extra;
+  engine->process(refusedKey, plain, extra);
+  engine->processSingleImage(plain, extra);
+  EXPECT_EQ(printed.text(),
+            "Failed to request image buffer: TSE not in RUNNING state\n"
+            "Skipped input frame: TSE not in RUNNING state\n"
+            "Skipped input frame: TSE not in RUNNING state\n");
+  EXPECT_TRUE(refused.data == nullptr && refusedKey == "kept" && events.pointCounts().size() == 2);
   engine->resumeEngine();
   frame(2.0);  // the same time stamp is taken again after the reset
   EXPECT_EQ(engine->lastTakenTime(), 2.0);
@@ -278,20 +290,6 @@ TEST_F(EngineTest, BadFramesPrintOneLineAndLeaveTheEngineWorking) {
   }
   EXPECT_TRUE(events.pointCounts().empty());
   EXPECT_EQ(engine->lastTakenTime(), -1.0);
-  // Outside RUNNING: the defined lines, nothing lent, nothing processed.
-  engine->pauseEngine();
-  orzavs_test::StdoutCapture printed;
-  ImageBuffer other = lendable(OrzaVSMobile::GRAY);
-  std::string key = "kept";
-  engine->requestImageBuffer(other, key);
-  engine->process(key, cases[1].image, extra);
-  engine->processSingleImage(cases[1].image, extra);
-  EXPECT_EQ(printed.text(),
-            "Failed to request image buffer: TSE not in RUNNING state\n"
-            "Skipped input frame: TSE not in RUNNING state\n"
-            "Skipped input frame: TSE not in RUNNING state\n");
-  EXPECT_TRUE(other.data == nullptr && key == "kept");
-  engine->resumeEngine();
   frame(0.0);  // still works
   ASSERT_TRUE(waitFor([&] { return events.decoded().size() == 1; }));
 }

@@ -75,8 +75,8 @@ m resume-no-readmit engine/TovraStateEngine.cpp "$E" \
 m module-id-check engine/TovraStateEngine.cpp "$E" \
   'if (id != VISUAL_SEARCH_SERVICE_MOD) return;' 'if (id == BARCODE_MOD) return;'
 m process-no-lock engine/TovraStateEngine.cpp "$E tsan:engine_concurrency_tests" \
-  $'std::lock_guard<std::mutex> lock(mutex_);\n  if (state_ != RUNNING) {\n    std::puts("Skipped input frame: TSE not in RUNNING state");\n    dropLent' \
-  $'if (state_ != RUNNING) {\n    std::puts("Skipped input frame: TSE not in RUNNING state");\n    dropLent'
+  $'MutexLock lock(mutex_);\n  if (state_ != RUNNING) {\n    reportLine("Skipped input frame: TSE not in RUNNING state");\n    dropLent' \
+  $'if (state_ != RUNNING) {\n    reportLine("Skipped input frame: TSE not in RUNNING state");\n    dropLent'
 m pool-slot-shared engine/FrameRecordManager.cpp "$E" \
   'slot && slot.use_count() == 1)' 'slot && slot.use_count() <= 2)'
 m pool-first-id-1 engine/FrameRecordManager.cpp "$E" \
@@ -84,7 +84,7 @@ m pool-first-id-1 engine/FrameRecordManager.cpp "$E" \
 m pool-restart-text engine/FrameRecordManager.cpp "$E" \
   '"Unable to restart frame record manager () as' '"Unable to restart frame record manager as'
 m pool-no-lock engine/FrameRecordManager.cpp "$E tsan:engine_concurrency_tests" \
-  $'getNewSlot() {\n  std::lock_guard<std::mutex> lock(mutex_);' 'getNewSlot() {'
+  $'getNewSlot() {\n  MutexLock lock(mutex_);' 'getNewSlot() {'
 m lend-rows-rounding engine/FrameRecord.cpp "$E" \
   'rows = (rows * 3) / 2;' 'rows = (rows * 3 + 1) / 2;'
 m copy-capacity-le engine/FrameRecord.cpp "$E" \
@@ -114,7 +114,7 @@ m pending-replaces-handler server/ServerDelegate.cpp "$S" \
 m push-keeps-pending server/ServerDelegate.cpp "$S" \
   $'handler = it->second;\n    pending_.erase(it);' 'handler = it->second;'
 m send-no-lock server/ServerDelegate.cpp "$S tsan:server_concurrency_tests" \
-  $'{\n    std::lock_guard<std::mutex> lock(mutex_);\n    // Registered before' $'{\n    // Registered before'
+  $'{\n    MutexLock lock(mutex_);\n    // Registered before' $'{\n    // Registered before'
 m response-code-default server/ServerResponse.h "$S" \
   'int32_t responseCode = 200;' 'int32_t responseCode = 0;'
 m roundtrip-default server/ServerResponse.h "$S" \
@@ -175,7 +175,7 @@ m source-module-unset vsearch/VisualSearchServiceJob.cpp "$V" \
 m awaiting-finished vsearch/VisualSearchServiceJob.cpp "$V" \
   'if (state_.load() != AwaitingReply) state_.store(Finished);' 'state_.store(Finished);'
 m server-error-text vsearch/VisualSearchServiceJob.cpp "$V" \
-  '"VSS SERVER ERROR: response: %s\n"' '"VSS SERVER ERROR: %s\n"'
+  '"VSS SERVER ERROR: response: %s"' '"VSS SERVER ERROR: %s"'
 
 # ---- features/ -----------------------------------------------------------------------------
 F=features_tests

@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include <chrono>
 #include <memory>
 #include <thread>
 #include <vector>
@@ -10,41 +9,21 @@
 #include "support/StdoutCapture.h"
 #include "support/TestJob.h"
 
-using orzavs_test::Gate;
-using orzavs_test::RunLog;
-using orzavs_test::StdoutCapture;
-using orzavs_test::TestJob;
+using namespace orzavs_test;
 using Tovra::TovraExecutionEngine;
 
-namespace {
-
-// With one worker the queue is strictly FIFO: once `marker` has finished, every job added
-// before it has been fully settled.
-void drain(TovraExecutionEngine& engine) {
-  TestJob marker(-1);
-  engine.addJob(&marker);
-  ASSERT_TRUE(marker.waitForState(Tovra::Finished));
-}
-
-std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, RunLog* log = nullptr) {
-  std::vector<std::unique_ptr<TestJob>> jobs;
-  for (int i = from; i <= to; ++i) jobs.emplace_back(new TestJob(i, log));
-  return jobs;
-}
-
-}  // namespace
-
-TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedIncludingJobsAddedByJobs) {
-  RunLog log;
+TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButAwaitingOnes) {
+  std::vector<int> log;  // read once the worker was joined
   Gate gate;
   std::vector<std::unique_ptr<TestJob>> jobs = makeJobs(0, 19, &log);
   TestJob added(20, &log);
   // The first job holds the worker until all others are queued, so they really wait in line.
   jobs[0]->work = [&](TestJob&) { gate.wait(); };
+  jobs[5]->endAwaitingReply = true;
   {
     StdoutCapture out;
     TovraExecutionEngine engine(1);
-    jobs[19]->work = [&](TestJob&) { engine.addJob(&added); };
+    jobs[19]->work = [&](TestJob&) { engine.addJob(&added); };  // a job adding a job
     engine.addJob(nullptr);  // ignored silently
     for (auto& job : jobs) engine.addJob(job.get());
     EXPECT_EQ(Tovra::Queued, jobs[1]->state());
@@ -54,8 +33,13 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedIncludingJobsAdde
   }
   std::vector<int> expected(21);
   for (int i = 0; i < 21; ++i) expected[i] = i;
-  EXPECT_EQ(expected, log.ids());
-  for (auto& job : jobs) EXPECT_EQ(Tovra::Finished, job->state());
+  EXPECT_EQ(expected, log);
+  for (auto& job : jobs) {
+    EXPECT_EQ(job == jobs[5] ? Tovra::AwaitingReply : Tovra::Finished, job->state());
+    EXPECT_EQ(1, job->runs());
+  }
+  for (int32_t busy : {Tovra::Queued, Tovra::Running, Tovra::AwaitingReply}) EXPECT_TRUE(Tovra::isBusyState(busy));
+  for (int32_t idle : {Tovra::Idle, Tovra::Finished}) EXPECT_FALSE(Tovra::isBusyState(idle));
 }
 
 TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
@@ -65,23 +49,20 @@ TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
     TovraExecutionEngine engine(0);
     EXPECT_EQ("Initialized TovraExecutionEngine with invalid number of threads\n", out.text());
     engine.addJob(&job);
-    std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    std::this_thread::sleep_for(Ms(20));
   }
   EXPECT_EQ(Tovra::Queued, job.state());  // destruction discards the queue without settling it
   EXPECT_EQ(0, job.runs());
 }
 
 TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResumed) {
-  Gate started, release;
+  Gate release;
   TestJob blocker(0);
-  blocker.work = [&](TestJob&) {
-    started.open();
-    release.wait();
-  };
+  blocker.work = [&](TestJob&) { release.wait(); };
   std::vector<std::unique_ptr<TestJob>> waiting = makeJobs(1, 3);
   TovraExecutionEngine engine(1);
   engine.addJob(&blocker);
-  ASSERT_TRUE(started.wait());
+  ASSERT_TRUE(blocker.waitForState(Tovra::Running));
   for (auto& job : waiting) engine.addJob(job.get());
   engine.cancelJobs();
   TestJob refused(4);
@@ -114,32 +95,17 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   EXPECT_EQ(0, racing.runs());
 }
 
-TEST(TovraExecutionEngineTest, AwaitingReplySurvivesSettling) {
-  TovraExecutionEngine engine(1);
-  TestJob job(1);
-  job.endAwaitingReply = true;
-  engine.addJob(&job);
-  drain(engine);
-  EXPECT_EQ(1, job.runs());
-  EXPECT_EQ(Tovra::AwaitingReply, job.state());
-  for (int32_t busy : {Tovra::Queued, Tovra::Running, Tovra::AwaitingReply}) EXPECT_TRUE(Tovra::isBusyState(busy));
-  for (int32_t idle : {Tovra::Idle, Tovra::Finished}) EXPECT_FALSE(Tovra::isBusyState(idle));
-}
-
 TEST(TovraExecutionEngineTest, DestructionSettlesQueuedJobsAndJoins) {
-  Gate started, release;
+  Gate release;
   TestJob running(0);
-  running.work = [&](TestJob&) {
-    started.open();
-    release.wait();
-  };
+  running.work = [&](TestJob&) { release.wait(); };
   std::vector<std::unique_ptr<TestJob>> queued = makeJobs(1, 4);
   auto engine = std::make_unique<TovraExecutionEngine>(1);
   engine->addJob(&running);
-  ASSERT_TRUE(started.wait());
+  ASSERT_TRUE(running.waitForState(Tovra::Running));
   for (auto& job : queued) engine->addJob(job.get());
   std::thread releaser([&] {
-    std::this_thread::sleep_for(std::chrono::milliseconds(30));
+    std::this_thread::sleep_for(Ms(30));
     release.open();
   });
   engine.reset();  // returns only once the worker drained the queue and was joined

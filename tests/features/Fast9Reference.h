@@ -51,19 +51,12 @@ inline int score(const uint8_t* plane, int stride, int x, int y, int b) {
   int low = b, high = 255;
   do {
     const int t = (low + high) / 2;
-    if (isCorner(plane, stride, x, y, t)) {
-      low = t;
-    } else {
-      high = t;
-    }
+    (isCorner(plane, stride, x, y, t) ? low : high) = t;
   } while (!(low == high - 1 || low == high));
   return low;
 }
 
-struct Detection {
-  std::vector<Fast9Corner> corners;
-  std::vector<int> scores;
-};
+struct Detection { std::vector<Fast9Corner> corners; std::vector<int> scores; };
 
 inline Detection detect(const uint8_t* plane, int width, int height, int stride, int b) {
   Detection d;
@@ -88,9 +81,8 @@ inline Detection suppress(const Detection& raw) {
     bool dominated = false;
     for (int dy = -1; dy <= 1; ++dy) {
       for (int dx = -1; dx <= 1; ++dx) {
-        if (dx == 0 && dy == 0) continue;
-        auto it = grid.find({c.x + dx, c.y + dy});
-        if (it != grid.end() && it->second >= raw.scores[i]) dominated = true;
+        const auto it = grid.find({c.x + dx, c.y + dy});
+        dominated |= (dx != 0 || dy != 0) && it != grid.end() && it->second >= raw.scores[i];
       }
     }
     if (!dominated) {
@@ -101,16 +93,12 @@ inline Detection suppress(const Detection& raw) {
   return kept;
 }
 
-// Exactly the bytes a plane of this geometry spans: (height-1)*stride + width.
-inline size_t planeBytes(int width, int height, int stride) {
-  return static_cast<size_t>(height - 1) * static_cast<size_t>(stride) + static_cast<size_t>(width);
-}
-
-// Planes of several kinds, every byte (row padding included) drawn from `rng`.
+// Planes of several kinds, exactly the (height-1)*stride + width bytes their geometry spans,
+// every byte (row padding included) drawn from `rng`.
 enum class Content { Noise, LowContrast, Blocks, Extremes };
 
 inline std::vector<uint8_t> makePlane(int width, int height, int stride, Content content, std::mt19937& rng) {
-  std::vector<uint8_t> p(planeBytes(width, height, stride));
+  std::vector<uint8_t> p(static_cast<size_t>(height - 1) * stride + static_cast<size_t>(width));
   std::uniform_int_distribution<int> any(0, 255);
   for (auto& v : p) v = static_cast<uint8_t>(any(rng));  // padding keeps this garbage
   for (int y = 0; y < height; ++y) {

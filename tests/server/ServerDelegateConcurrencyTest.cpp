@@ -1,93 +1,60 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
+#include <map>
 #include <memory>
 #include <string>
 #include <thread>
 #include <vector>
 
-#include "server/ServerDelegate.h"
-#include "support/RecordingTransport.h"
+#include "support/Fakes.h"
 #include "support/TestJob.h"
 
-using orzavs_test::makeRequest;
-using orzavs_test::makeResponse;
-using orzavs_test::RecordingHandler;
-using orzavs_test::RecordingTransport;
+using namespace orzavs_test;
 using Tovra::Server::ServerResponse;
 
-namespace {
-
-// Counts deliveries per id (ids are "r<index>").
-class CountingHandler : public Tovra::Server::ServerResponseHandler {
- public:
-  explicit CountingHandler(size_t n) : counts_(n) {}
-  void handleServerResponse(const ServerResponse& response) override {
-    counts_[std::stoul(response.id.substr(1))].fetch_add(1);
-  }
-  int count(size_t i) const { return counts_[i].load(); }
-
- private:
-  std::vector<std::atomic<int>> counts_;
-};
-
-}  // namespace
-
-// Several client threads push the same replies at once: each id reaches its handler exactly
-// once, however the pushes interleave.
-TEST(ServerDelegateConcurrencyTest, RacingPushesDeliverEachIdExactlyOnce) {
-  constexpr size_t kIds = 400;
-  RecordingTransport transport;
-  CountingHandler handler(kIds);
-  for (size_t i = 0; i < kIds; ++i) transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
-  std::vector<std::thread> pushers;
-  for (int p = 0; p < 4; ++p) {
-    pushers.emplace_back([&, p] {
-      for (size_t k = 0; k < kIds; ++k) {
-        transport.pushServerResponse(makeResponse("r" + std::to_string(p % 2 == 0 ? k : kIds - 1 - k)));
-      }
-    });
-  }
-  for (auto& t : pushers) t.join();
-  for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i)) << "id r" << i;
-  EXPECT_EQ(0u, transport.pendingCount());
-}
-
-// Requests are sent on one thread while their replies are pushed on another, as a job on the
-// worker thread and the client's network thread do. The two threads keep in step through
-// relaxed counters, which order nothing: only the delegate's own lock may order its table.
-TEST(ServerDelegateConcurrencyTest, SendsAndPushesOnDifferentThreads) {
+// Requests are sent on one thread while two others push every reply, as a job on the worker
+// thread and the client's network threads do: each id reaches its handler exactly once, however
+// the pushes interleave. The threads keep in step through relaxed counters, which order nothing:
+// only the delegate's own lock may order its table.
+TEST(ServerDelegateConcurrencyTest, SendsAndRacingPushesOnOtherThreadsDeliverEachIdOnce) {
   constexpr size_t kIds = 600;
-  RecordingTransport transport;
-  CountingHandler handler(kIds);
-  std::atomic<size_t> sent{0}, pushed{0};
+  FakeTransport transport;
+  RecordingHandler handler;
+  std::atomic<size_t> sent{0}, pushed[2]{};
   std::thread sender([&] {
     for (size_t i = 0; i < kIds; ++i) {
-      while (i > pushed.load(std::memory_order_relaxed) + 4) std::this_thread::yield();
+      while (i > std::min(pushed[0].load(std::memory_order_relaxed), pushed[1].load(std::memory_order_relaxed)) + 4) {
+        std::this_thread::yield();
+      }
       transport.sendServerRequest(makeRequest("r" + std::to_string(i), &handler));
       sent.store(i + 1, std::memory_order_relaxed);
     }
   });
-  std::thread pusher([&] {
+  auto pusher = [&](std::atomic<size_t>& mine) {
     for (size_t next = 0; next < kIds; std::this_thread::yield()) {
       for (const size_t available = sent.load(std::memory_order_relaxed); next < available; ++next) {
         transport.pushServerResponse(makeResponse("r" + std::to_string(next)));
-        pushed.store(next + 1, std::memory_order_relaxed);
+        mine.store(next + 1, std::memory_order_relaxed);
       }
     }
-  });
-  sender.join();
-  pusher.join();
-  for (size_t i = 0; i < kIds; ++i) ASSERT_EQ(1, handler.count(i));
+  };
+  std::thread first(pusher, std::ref(pushed[0])), second(pusher, std::ref(pushed[1]));
+  for (std::thread* t : {&sender, &first, &second}) t->join();
+  std::map<std::string, int> deliveries;
+  for (const ServerResponse& response : handler.responses()) ++deliveries[response.id];
+  EXPECT_EQ(kIds, deliveries.size());
+  for (const auto& d : deliveries) ASSERT_EQ(1, d.second) << d.first;
   EXPECT_EQ(0u, transport.pendingCount());
 }
 
 // forgetHandler must not return while a delivery to that handler is still running on another
 // thread: only then may the handler be destroyed.
 TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
-  RecordingTransport transport;
-  orzavs_test::Gate entered, release;
+  FakeTransport transport;
+  Gate entered, release;
   std::atomic<bool> deliveryDone{false}, forgotten{false};
   RecordingHandler handler;
   handler.onResponse = [&](const ServerResponse&) {
@@ -115,7 +82,7 @@ TEST(ServerDelegateConcurrencyTest, ForgetHandlerWaitsForAnInFlightDelivery) {
 // The pattern a job uses on destruction: forget the handler, then free it, while a late reply
 // for it is being pushed on another thread. ASan/TSan catch a delivery into freed memory.
 TEST(ServerDelegateConcurrencyTest, HandlerDestroyedAfterForgetWhileRepliesRace) {
-  RecordingTransport transport;
+  FakeTransport transport;
   for (int round = 0; round < 300; ++round) {
     auto handler = std::make_unique<RecordingHandler>();
     std::atomic<int> touched{0};

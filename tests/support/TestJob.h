@@ -2,55 +2,42 @@
 #define ORZAVS_TESTS_SUPPORT_TESTJOB_H
 
 #include <atomic>
-#include <chrono>
-#include <condition_variable>
-#include <cstdint>
 #include <functional>
-#include <mutex>
+#include <memory>
 #include <vector>
 
 #include "exec/Job.h"
+#include "support/Threads.h"
 
 namespace orzavs_test {
 
-// Records, in order, the ids of the jobs that ran. Safe from any thread.
-class RunLog {
- public:
-  void add(int id);
-  std::vector<int> ids() const;
-
- private:
-  mutable std::mutex mutex_;
-  std::vector<int> ids_;
-};
-
-// A one-shot gate: wait() blocks until open() (or until the timeout; returns whether it opened).
-class Gate {
- public:
-  void open();
-  bool wait(std::chrono::milliseconds timeout = std::chrono::seconds(10));
-  bool isOpen() const;
-
- private:
-  mutable std::mutex mutex_;
-  std::condition_variable cv_;
-  bool open_ = false;
-};
-
-// A job that follows the job state contract with one atomic state word, counts its runs and
+// A job that follows the job state contract with one atomic state word, counts its runs,
+// appends its id to `log` when it runs (read the log only once the workers were joined) and
 // optionally does some work (which may block, add jobs, or end AwaitingReply).
 class TestJob : public Tovra::Job {
  public:
-  explicit TestJob(int id = 0, RunLog* log = nullptr);
+  explicit TestJob(int id = 0, std::vector<int>* log = nullptr) : id_(id), log_(log) {}
 
-  void markQueued() override;
-  void run() override;
-  void finishUnlessAwaiting() override;
+  void markQueued() override {
+    state_.store(Tovra::Queued);
+    if (onMarkQueued) onMarkQueued(*this);
+  }
+  void run() override {
+    state_.store(Tovra::Running);
+    runs_.fetch_add(1);
+    if (log_ != nullptr) log_->push_back(id_);
+    if (work) work(*this);
+    if (endAwaitingReply) state_.store(Tovra::AwaitingReply);
+  }
+  void finishUnlessAwaiting() override {
+    if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
+  }
 
-  // Polls every millisecond until the state is `wanted`; false after the timeout.
-  bool waitForState(int32_t wanted, std::chrono::milliseconds timeout = std::chrono::seconds(10));
+  // Polls until the state is `wanted`; false after the timeout.
+  bool waitForState(int32_t wanted, Ms timeout = Ms(10000)) {
+    return waitFor([&] { return state_.load() == wanted; }, timeout);
+  }
 
-  int id() const { return id_; }
   int32_t state() const { return state_.load(); }
   int runs() const { return runs_.load(); }
 
@@ -63,10 +50,17 @@ class TestJob : public Tovra::Job {
 
  private:
   const int id_;
-  RunLog* log_;
+  std::vector<int>* log_;
   std::atomic<int32_t> state_{Tovra::Idle};
   std::atomic<int> runs_{0};
 };
+
+// Jobs numbered from..to (inclusive), logging into `log`.
+inline std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, std::vector<int>* log = nullptr) {
+  std::vector<std::unique_ptr<TestJob>> jobs;
+  for (int i = from; i <= to; ++i) jobs.emplace_back(new TestJob(i, log));
+  return jobs;
+}
 
 }  // namespace orzavs_test
 

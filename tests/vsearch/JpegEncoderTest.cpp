@@ -57,22 +57,29 @@ std::vector<uint8_t> packedFrame(int w, int h, int channels, int stride) {
 // quality 50; noise at quality 100 gives 32.2 dB through the fast integer DCT. A lost block, a
 // swapped plane or a misaddressed row drops them far lower.
 TEST(JpegEncoder, YuvFramesOfAnySizeDecodeCloseToTheirInput) {
-  const int sizes[][2] = {{320, 240}, {640, 481}, {33, 17}, {17, 1}, {6, 30}, {3, 3}, {1, 1}};
-  for (ImageFormat format : kYuvFormats) {
-    for (const auto& s : sizes) {
-      const int w = s[0], h = s[1];
-      SCOPED_TRACE(label(format, w, h));
-      const Yuv420 img = makeYuv(w, h);
-      const Decoded d = decodeJpeg(yuvJpeg(packYuv(img, format), w, h, format));
+  const int sizes[][2] = {{320, 240}, {640, 481}, {33, 17}, {17, 1}, {6, 30}, {3, 3}, {1, 1}, {100, 36}, {17, 481}};
+  for (const auto& s : sizes) {
+    const int w = s[0], h = s[1];
+    const Yuv420 img = makeYuv(w, h);
+    std::vector<uint8_t> streams[3];
+    for (int f = 0; f < 3; ++f) {
+      SCOPED_TRACE(label(kYuvFormats[f], w, h));
+      streams[f] = yuvJpeg(packYuv(img, kYuvFormats[f]), w, h, kYuvFormats[f]);
+      const Decoded d = decodeJpeg(streams[f]);
       ASSERT_TRUE(d.ok);
       EXPECT_TRUE(d.width == w && d.height == h && d.colorSpace == JCS_YCbCr && !d.progressive && d.warnings == 0);
       EXPECT_EQ(std::vector<int>({d.samp[0][0], d.samp[0][1], d.samp[1][0], d.samp[1][1], d.samp[2][0], d.samp[2][1]}),
                 std::vector<int>({2, 2, 1, 1, 1, 1}));
       EXPECT_GE(lumaPsnr(d, img), w * h == 1 ? 40.0 : 45.0);
       if (w >= 16 && h >= 16) {
-        EXPECT_GE(chromaPsnr(d, img, 1), 42.0);
-        EXPECT_GE(chromaPsnr(d, img, 2), 42.0);
+        EXPECT_GE(std::min(chromaPsnr(d, img, 1), chromaPsnr(d, img, 2)), 42.0);
       }
+    }
+    // One picture gives one stream in both semi-planar layouts, and in I420 too when no MCU is
+    // partial.
+    EXPECT_EQ(streams[1], streams[2]) << label(NV12, w, h);
+    if (w % 16 == 0 && h % 16 == 0) {
+      EXPECT_EQ(streams[0], streams[1]) << label(I420, w, h);
     }
   }
 }
@@ -98,23 +105,19 @@ TEST(JpegEncoder, PackedFramesDecodeCloseToTheirInputWhateverTheirPadding) {
   EXPECT_EQ(expected, packedJpeg(bgra, w, h, 4 * w, 4, BGRA));
   EXPECT_EQ(expected, packedJpeg(bgra, w, h, 4 * w, 4, BGRX));
   EXPECT_NE(expected, packedJpeg(rgb, w, h, 3 * w, 3, BGR));
-
   for (int channels : {1, 3, 4}) {
     const ImageFormat format = channels == 1 ? GRAY : channels == 3 ? BGR : BGRA;
-    EXPECT_EQ(
-        packedJpeg(packedFrame(w, h, channels, w * channels), w, h, w * channels, channels, format),
-        packedJpeg(packedFrame(w, h, channels, w * channels + 13), w, h, w * channels + 13, channels, format))
-        << channels;
+    const int padded = w * channels + 13;
+    EXPECT_EQ(packedJpeg(packedFrame(w, h, channels, w * channels), w, h, w * channels, channels, format),
+              packedJpeg(packedFrame(w, h, channels, padded), w, h, padded, channels, format)) << channels;
+    // One-pixel frames.
+    EXPECT_EQ(decodeJpeg(packedJpeg(std::vector<uint8_t>(channels, 200), 1, 1, channels, channels, BGRA)).width, 1);
   }
   const std::vector<uint8_t> grey = packedFrame(w, h, 1, w);
   EXPECT_EQ(packedJpeg(grey, w, h, w, 1, GRAY), packedJpeg(grey, w, h, w, 1, RGB));
   const Decoded g = decodeJpeg(packedJpeg(grey, w, h, w, 1, GRAY));
   EXPECT_EQ(g.colorSpace, JCS_GRAYSCALE);
   EXPECT_GE(psnr(g.pixels.data(), 1, grey.data(), 1, grey.size()), 48.0);  // measured 54.4 dB
-  // One-pixel frames.
-  for (int channels : {1, 3, 4})
-    EXPECT_EQ(
-        decodeJpeg(packedJpeg(std::vector<uint8_t>(channels, 200), 1, 1, channels, channels, BGRA)).width, 1);
 }
 
 // Every full work buffer and then the tail reach the output, in order: a stream many times the
@@ -137,28 +140,12 @@ TEST(JpegEncoder, LongStreamsArriveWhole) {
   EXPECT_EQ(out, first);
 }
 
-TEST(JpegEncoder, EquivalentYuvFramesGiveIdenticalStreams) {
-  // NV21 and NV12 frames whose pairs are swapped (rows of w bytes holding w/2 pairs).
-  for (const auto& s : {std::make_pair(64, 48), std::make_pair(100, 36), std::make_pair(33, 17),
-                        std::make_pair(17, 481), std::make_pair(1, 1)}) {
-    const int w = s.first, h = s.second;
-    const std::vector<uint8_t> nv21 = packYuv(makeYuv(w, h), NV21);
-    std::vector<uint8_t> nv12 = nv21;
-    for (int r = 0; r < h / 2; ++r)
-      for (int c = 0; c < w / 2; ++c)
-        std::swap(nv12[size_t(w) * (h + r) + 2 * c], nv12[size_t(w) * (h + r) + 2 * c + 1]);
-    EXPECT_EQ(yuvJpeg(nv21, w, h, NV21), yuvJpeg(nv12, w, h, NV12)) << label(NV21, w, h);
-  }
-  // I420 and semi-planar frames of one picture, when no MCU is partial.
-  const Yuv420 img = makeYuv(64, 48);
-  const std::vector<uint8_t> i420 = yuvJpeg(packYuv(img, I420), 64, 48, I420);
-  EXPECT_EQ(i420, yuvJpeg(packYuv(img, NV12), 64, 48, NV12));
-  EXPECT_EQ(i420, yuvJpeg(packYuv(img, NV21), 64, 48, NV21));
-  EXPECT_NE(i420, yuvJpeg(packYuv(img, NV21), 64, 48, NV12));  // the pair order matters
-  // The stride is not used.
+TEST(JpegEncoder, ThePairOrderMattersAndTheStrideDoesNot) {
+  const std::vector<uint8_t> nv21 = packYuv(makeYuv(64, 48), NV21);
+  EXPECT_NE(yuvJpeg(nv21, 64, 48, NV21), yuvJpeg(nv21, 64, 48, NV12));
   std::vector<uint8_t> a, b, work;
-  ASSERT_TRUE(encodeYUVToJpeg(packYuv(img, NV21).data(), 48, 64, 4096, NV21, a, 90, work));
-  ASSERT_TRUE(encodeYUVToJpeg(packYuv(img, NV21).data(), 48, 64, -1, NV21, b, 90, work));
+  ASSERT_TRUE(encodeYUVToJpeg(nv21.data(), 48, 64, 4096, NV21, a, 90, work));
+  ASSERT_TRUE(encodeYUVToJpeg(nv21.data(), 48, 64, -1, NV21, b, 90, work));
   EXPECT_EQ(a, b);
 }
 
@@ -179,42 +166,6 @@ TEST(JpegEncoder, QualityIsClampedAndTablesStayBaseline) {
   EXPECT_EQ(decodeJpeg(yuvAt(100)).maxQuant, 1);
 }
 
-// What the library reads past the bottom of the picture (it encodes whole blocks), shown by
-// equivalence: a short frame gives the stream of a taller frame with as many block rows whose
-// extra rows hold what the encoder supplies, up to the height in the frame header. Luminance rows
-// repeat the last row; semi-planar chroma rows the last band does not refill keep the previous
-// band's rows (chroma row r copies row r - 8), and are mid-grey in a frame of one band.
-TEST(JpegEncoder, RowsPastTheBottomComeFromInsideThePlane) {
-  struct Case {
-    int shortH, tallH;
-    bool grey;
-  } cases[] = {{20, 24, false}, {17, 24, false}, {4, 8, true}};
-  const int w = 64, cw = 32;
-  for (ImageFormat format : {NV21, NV12}) {
-    for (const Case& c : cases) {
-      SCOPED_TRACE(label(format, w, c.shortH));
-      const Yuv420 small = makeYuv(w, c.shortH);
-      Yuv420 tall = makeYuv(w, c.tallH);
-      for (int r = 0; r < c.tallH; ++r)
-        std::copy_n(&small.y[std::min(r, c.shortH - 1) * w], w, &tall.y[r * w]);
-      for (int i = 0; i < tall.ch() * cw; ++i) {
-        const int r = i / cw, from = (r < small.ch() ? r : r - 8) * cw + i % cw;
-        const bool grey = r >= small.ch() && c.grey;
-        tall.u[i] = grey ? 0x80 : small.u[from];
-        tall.v[i] = grey ? 0x80 : small.v[from];
-      }
-      const std::vector<uint8_t> a = yuvJpeg(packYuv(small, format), w, c.shortH, format);
-      std::vector<uint8_t> b = yuvJpeg(packYuv(tall, format), w, c.tallH, format);
-      ASSERT_EQ(a.size(), b.size());
-      size_t sof = 0;  // FF C0, length (2), precision (1), height (2, big-endian)
-      while (sof + 6 < b.size() && !(b[sof] == 0xFF && b[sof + 1] == 0xC0)) ++sof;
-      ASSERT_EQ(b[sof + 6], c.tallH);
-      b[sof + 6] = static_cast<uint8_t>(c.shortH);
-      EXPECT_EQ(a, b);
-    }
-  }
-}
-
 TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAreAccepted) {
   const std::vector<uint8_t> frame(64 * 64 * 4, 0x80);
   std::vector<uint8_t> out, work;
@@ -224,10 +175,8 @@ TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAr
     EXPECT_TRUE(out.empty() && work.size() == 4096u);
     return ok;
   };
-  EXPECT_FALSE(yuv(nullptr, 16, 16, NV21));
-  EXPECT_FALSE(yuv(frame.data(), 0, 16, NV21));
-  EXPECT_FALSE(yuv(frame.data(), -16, 16, NV12));
-  EXPECT_FALSE(yuv(frame.data(), 16, INT32_MIN, I420));
+  EXPECT_FALSE(yuv(nullptr, 16, 16, NV21) || yuv(frame.data(), 0, 16, NV21) || yuv(frame.data(), -16, 16, NV12) ||
+               yuv(frame.data(), 16, INT32_MIN, I420));
   for (int format : {-1, 3, 7, 1000}) EXPECT_FALSE(yuv(frame.data(), 16, 16, format)) << format;
 
   auto packed = [&](const uint8_t* px, int h, int w, int stride, int channels) {
@@ -236,10 +185,8 @@ TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAr
     EXPECT_TRUE(ok || out.empty());
     return ok;
   };
-  EXPECT_FALSE(packed(nullptr, 16, 16, 48, 3));
-  EXPECT_FALSE(packed(frame.data(), 0, 16, 48, 3));
-  EXPECT_FALSE(packed(frame.data(), 16, -1, 48, 3));
-  EXPECT_FALSE(packed(frame.data(), 16, 16, -48, 3));
+  EXPECT_FALSE(packed(nullptr, 16, 16, 48, 3) || packed(frame.data(), 0, 16, 48, 3) ||
+               packed(frame.data(), 16, -1, 48, 3) || packed(frame.data(), 16, 16, -48, 3));
   for (int channels : {0, -3, 2}) EXPECT_FALSE(packed(frame.data(), 16, 16, 48, channels)) << channels;
 
   // Rows closer together than their length overlap inside the frame: stride 0 repeats one row.

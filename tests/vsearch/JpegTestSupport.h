@@ -9,7 +9,6 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
-#include <stdexcept>
 #include <vector>
 
 #include <jpeglib.h>
@@ -106,9 +105,9 @@ struct DecodeError {
 }
 inline void silent(j_common_ptr) {}
 
-// Reads the header into `d`, then (with `out`) every scan line. Only trivially destructible
-// objects live here because the error hook longjmps back.
-inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Decoded* d, uint8_t* out) {
+// Reads the header, then every scan line, into `d`. Only trivially destructible objects live in
+// this frame because the error hook longjmps back (the pixels belong to the caller's `d`).
+inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Decoded* d) {
   jpeg_decompress_struct c;
   std::memset(&c, 0, sizeof c);
   DecodeError err;
@@ -133,17 +132,16 @@ inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Dec
       if (c.quant_tbl_ptrs[t]->quantval[i] > d->maxQuant) d->maxQuant = c.quant_tbl_ptrs[t]->quantval[i];
   c.out_color_space = c.jpeg_color_space == JCS_GRAYSCALE ? JCS_GRAYSCALE : space;
   d->components = c.out_color_space == JCS_GRAYSCALE ? 1 : 3;
-  if (out != nullptr) {
-    c.do_fancy_upsampling = FALSE;
-    jpeg_start_decompress(&c);
-    while (c.output_scanline < c.output_height) {
-      JSAMPROW row = out + static_cast<size_t>(c.output_width) * d->components * c.output_scanline;
-      jpeg_read_scanlines(&c, &row, 1);
-    }
-    jpeg_finish_decompress(&c);
-    d->warnings = err.pub.num_warnings;
-    d->bytesLeft = c.src->bytes_in_buffer;
+  d->pixels.assign(static_cast<size_t>(d->width) * d->height * d->components, 0);
+  c.do_fancy_upsampling = FALSE;
+  jpeg_start_decompress(&c);
+  while (c.output_scanline < c.output_height) {
+    JSAMPROW row = &d->pixels[static_cast<size_t>(c.output_width) * d->components * c.output_scanline];
+    jpeg_read_scanlines(&c, &row, 1);
   }
+  jpeg_finish_decompress(&c);
+  d->warnings = err.pub.num_warnings;
+  d->bytesLeft = c.src->bytes_in_buffer;
   jpeg_destroy_decompress(&c);
   return true;
 }
@@ -151,9 +149,7 @@ inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Dec
 
 inline Decoded decodeJpeg(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space = JCS_YCbCr) {
   Decoded d;
-  if (jpeg.empty() || !detail::decodeRaw(jpeg, space, &d, nullptr)) return d;
-  d.pixels.assign(static_cast<size_t>(d.width) * d.height * d.components, 0);
-  d.ok = detail::decodeRaw(jpeg, space, &d, d.pixels.data());
+  d.ok = !jpeg.empty() && detail::decodeRaw(jpeg, space, &d);
   return d;
 }
 

@@ -27,11 +27,13 @@ bool isAttached(JavaVM* vm) {
   return vm->GetEnv(&env, JNI_VERSION_1_2) == JNI_OK;
 }
 
-// Runs `call` on a new native thread and describes it: "detached-before;" or
+// Runs `call` on a new native thread and describes it, as a Java string: "detached-before;" or
 // "attached-before;", what `call` said, "threw=<type>:<what>;" if it threw, and
 // "detached-after" or "attached-after".
 template <class Call>
-std::string onNativeThread(JavaVM* vm, Call call) {
+jstring onNativeThread(JNIEnv* env, Call call) {
+  JavaVM* vm = nullptr;
+  env->GetJavaVM(&vm);
   std::string report;
   std::thread worker([&] {
     report += isAttached(vm) ? "attached-before;" : "detached-before;";
@@ -45,16 +47,8 @@ std::string onNativeThread(JavaVM* vm, Call call) {
     report += isAttached(vm) ? "attached-after" : "detached-after";
   });
   worker.join();
-  return report;
+  return env->NewStringUTF(report.c_str());
 }
-
-JavaVM* vmOf(JNIEnv* env) {
-  JavaVM* vm = nullptr;
-  env->GetJavaVM(&vm);
-  return vm;
-}
-
-jstring toJava(JNIEnv* env, const std::string& text) { return env->NewStringUTF(text.c_str()); }
 
 std::string fromJava(JNIEnv* env, jstring text) {
   if (text == nullptr) return std::string();
@@ -71,10 +65,10 @@ ORZAVS_TEST_HOOK(jstring, showMessageOnNativeThread)(JNIEnv* env, jclass, jlong 
                                                      jstring message) {
   auto* target = fromHandle<Tovra::EventDelegateBase>(delegate);
   const std::string text = fromJava(env, message);
-  return toJava(env, onNativeThread(vmOf(env), [&] {
-                  target->showMessage(text);
-                  return std::string("called;");
-                }));
+  return onNativeThread(env, [&] {
+    target->showMessage(text);
+    return std::string("called;");
+  });
 }
 
 // didDecode on a native thread with `count` results ("result-0", ...; contentType 10 with a
@@ -93,10 +87,10 @@ ORZAVS_TEST_HOOK(jstring, didDecodeOnNativeThread)(JNIEnv* env, jclass, jlong de
   Tovra::ResultMetadata metadata;
   metadata.queryID = fromJava(env, queryId);
   metadata.accumulatedQueries = {"q-1", "q-2"};
-  return toJava(env, onNativeThread(vmOf(env), [&] {
-                  target->didDecode(results, metadata);
-                  return std::string("called;");
-                }));
+  return onNativeThread(env, [&] {
+    target->didDecode(results, metadata);
+    return std::string("called;");
+  });
 }
 
 // sendServerRequest of a request with id `id` on a native thread, as the engine's worker does.
@@ -105,10 +99,9 @@ ORZAVS_TEST_HOOK(jstring, sendRequestOnNativeThread)(JNIEnv* env, jclass, jlong 
   auto* target = fromHandle<Tovra::Server::ServerDelegate>(delegate);
   Tovra::Server::ServerRequest request;
   request.id = fromJava(env, id);
-  return toJava(env, onNativeThread(vmOf(env), [&] {
-                  const bool result = target->sendServerRequest(request);
-                  return std::string(result ? "result=true;" : "result=false;");
-                }));
+  return onNativeThread(env, [&] {
+    return std::string(target->sendServerRequest(request) ? "result=true;" : "result=false;");
+  });
 }
 
 // showMessage(message) on the calling Java thread; true when the thread is still attached after.
@@ -118,5 +111,7 @@ ORZAVS_TEST_HOOK(jboolean, showMessageOnThisThread)(JNIEnv* env, jclass, jlong d
   target->showMessage(fromJava(env, message));
   // A Java exception raised by the callback is returned to Java by the library's own frame
   // only inside its exported functions; here none may be pending.
-  return static_cast<jboolean>(isAttached(vmOf(env)) && !env->ExceptionCheck());
+  JavaVM* vm = nullptr;
+  env->GetJavaVM(&vm);
+  return static_cast<jboolean>(isAttached(vm) && !env->ExceptionCheck());
 }

@@ -7,18 +7,9 @@
 
 namespace {
 
-class Events : public Tovra::EventDelegateBase {
- public:
-  void didDetectInterestPoints(const std::vector<OrzaVSMobile::Point2f>& points) override {
-    lastCount = points.size();
-  }
-  size_t lastCount = 0;
-};
-
 class Transport : public Tovra::Server::ServerDelegate {
  public:
-  bool sendServerRequestImpl(const Tovra::Server::ServerRequest& request) override {
-    (void)request;
+  bool sendServerRequestImpl(const Tovra::Server::ServerRequest&) override {
     return false;  // this client never reaches a server
   }
 };
@@ -29,32 +20,24 @@ void keepLine(void* lastLine, const char* line) { *static_cast<std::string*>(las
 }  // namespace
 
 int main() {
-  Events events;
+  Tovra::EventDelegateBase events;
   Transport transport;
   Tovra::CameraResRequirement requirement;
-  {
-    Tovra::TovraStateEngineFacade facade(&events);
-    facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
-    facade.getCameraResRequirement(requirement);
-  }
-
   OrzaVSMobile::ImageBuffer buffer;
   const std::vector<uint8_t> pixels(64, 128);
   buffer.allocateBuffer(64);
   const int32_t filled = buffer.fillBuffer(pixels.data(), 64);
-
   std::string lastLine;
   OrzaVSMobile::setDiagnosticSink(&keepLine, &lastLine);
   {
     Tovra::TovraStateEngineFacade facade(&events);
+    facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
+    facade.getCameraResRequirement(requirement);
     OrzaVSMobile::ExtraFrameData extra;
     facade.process(buffer, extra);  // not started: refused with a line
   }
   OrzaVSMobile::setDiagnosticSink(nullptr, nullptr);
-
-  std::printf("camera %d-%d, filled %d, module %s, line '%s'\n", requirement.minHeight,
-              requirement.maxHeight, filled,
-              Tovra::ObjectModuleIDNames.at(Tovra::VISUAL_SEARCH_SERVICE_MOD).c_str(),
-              lastLine.c_str());
+  std::printf("camera %d-%d, filled %d, module %s, line '%s'\n", requirement.minHeight, requirement.maxHeight,
+              filled, Tovra::ObjectModuleIDNames.at(Tovra::VISUAL_SEARCH_SERVICE_MOD).c_str(), lastLine.c_str());
   return filled == 64 ? 0 : 1;
 }

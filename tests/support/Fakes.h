@@ -1,42 +1,32 @@
-#ifndef ORZAVS_TESTS_SUPPORT_ENGINEFAKES_H
-#define ORZAVS_TESTS_SUPPORT_ENGINEFAKES_H
+#ifndef ORZAVS_TESTS_SUPPORT_FAKES_H
+#define ORZAVS_TESTS_SUPPORT_FAKES_H
 
 // Test doubles for driving the engine as a client would: an event delegate that records its
-// callbacks, a transport that records requests and answers from its own thread, frames.
+// callbacks, a transport that records requests and answers from its own thread, a response
+// handler that records what it gets, frames, and an engine wired to all of them.
 
 #include <chrono>
 #include <condition_variable>
 #include <cstdint>
 #include <deque>
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <string>
 #include <thread>
 #include <vector>
 
+#include <gtest/gtest.h>
+
+#include "engine/TovraStateEngine.h"
+#include "support/Threads.h"
 #include "server/ServerDelegate.h"
 #include "types/EventDelegateBase.h"
 #include "types/ImageFormat.h"
 
 namespace orzavs_test {
 
-using Clock = std::chrono::steady_clock;
-using Ms = std::chrono::milliseconds;
-
-inline bool waitFor(const std::function<bool()>& done, Ms timeout = Ms(5000)) {
-  const auto end = Clock::now() + timeout;
-  while (!done()) {
-    if (Clock::now() > end) return false;
-    std::this_thread::sleep_for(Ms(1));
-  }
-  return true;
-}
-
-struct ErrorCall {
-  Tovra::ObjectModuleID module;
-  Tovra::Server::ResponseStatus status;
-  int32_t code;
-};
+struct ErrorCall { Tovra::ObjectModuleID module; Tovra::Server::ResponseStatus status; int32_t code; };
 
 // Records callbacks from any thread; `decodeHook` runs first in didDecode.
 class RecordingEvents : public Tovra::EventDelegateBase {
@@ -78,6 +68,17 @@ class RecordingEvents : public Tovra::EventDelegateBase {
   std::vector<size_t> pointCounts_;
 };
 
+// A reply body with one result per content type text.
+inline std::string replyBody(const std::string& queryId, const std::vector<std::string>& types = {"PIDN"}) {
+  std::string results;
+  for (size_t i = 0; i < types.size(); ++i) {
+    results += (i ? "," : "") + std::string("{\"content\":\"c") + std::to_string(i) +
+               "\",\"contentType\":\"" + types[i] + "\",\"properties\":{}}";
+  }
+  return "{\"queryId\":\"" + queryId + "\",\"quillmark\":{\"searchResult\":[" + results +
+         "],\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[]}}}";
+}
+
 // What the transport kept of one request.
 struct SentRequest {
   std::string id;
@@ -86,17 +87,14 @@ struct SentRequest {
 };
 
 // Records requests; with a responder, answers each from its own thread after the chosen delay
-// (or never, when the responder returns false).
+// (or never, when the responder returns false). sendServerRequestImpl returns `result`.
 class FakeTransport : public Tovra::Server::ServerDelegate {
  public:
   using Responder = std::function<bool(const SentRequest&, Tovra::Server::ServerResponse&, Ms& delay)>;
 
   FakeTransport() : thread_([this] { loop(); }) {}
   ~FakeTransport() override {
-    {
-      std::lock_guard<std::mutex> lock(mutex_);
-      stopping_ = true;
-    }
+    locked([this] { stopping_ = true; });
     wake_.notify_all();
     thread_.join();
   }
@@ -105,7 +103,13 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     locked([&] { responder_ = std::move(responder); });
   }
   // Answers every request with a reply whose query id is the request id.
-  void answerEverything(Ms delay = Ms(0));
+  void answerEverything(Ms delay = Ms(0)) {
+    setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {
+      reply.responseStr = replyBody(sent.id);
+      d = delay;
+      return true;
+    });
+  }
 
   // Runs synchronously inside sendServerRequestImpl, on the sender's thread.
   std::function<void(const Tovra::Server::ServerRequest&)> onSend;
@@ -127,8 +131,9 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     }
     wake_.notify_all();
     if (onSend) onSend(request);
-    return true;
+    return result;
   }
+  bool result = true;
 
   void pushLater(const Tovra::Server::ServerResponse& reply, Ms delay = Ms(0)) {
     locked([&] { queue_.push_back({reply, Clock::now() + delay}); });
@@ -139,15 +144,10 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   size_t sentCount() const { return locked([this] { return sent_.size(); }); }
   size_t pushedCount() const { return locked([this] { return pushed_; }); }
   size_t droppedCount() const { return locked([this] { return dropped_; }); }
-  bool idle() const {  // every queued reply pushed
-    return locked([this] { return queue_.empty() && !pushing_; });
-  }
+  bool idle() const { return locked([this] { return queue_.empty() && !pushing_; }); }  // all pushed
 
  private:
-  struct Scheduled {
-    Tovra::Server::ServerResponse reply;
-    Clock::time_point due;
-  };
+  struct Scheduled { Tovra::Server::ServerResponse reply; Clock::time_point due; };
   template <typename F>
   auto locked(F read) const -> decltype(read()) {
     std::lock_guard<std::mutex> lock(mutex_);
@@ -176,34 +176,14 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
 
   mutable std::mutex mutex_;
   std::condition_variable wake_;
-  bool stopping_ = false;
-  bool pushing_ = false;
+  bool stopping_ = false, pushing_ = false;
   Responder responder_;
   std::vector<SentRequest> sent_;
   std::deque<Scheduled> queue_;
-  size_t pushed_ = 0;
-  size_t dropped_ = 0;
+  size_t pushed_ = 0, dropped_ = 0;
   std::thread thread_;  // last: starts once every other member exists
 };
 
-// A reply body with one result per content type text.
-inline std::string replyBody(const std::string& queryId, const std::vector<std::string>& types = {"PIDN"}) {
-  std::string results;
-  for (size_t i = 0; i < types.size(); ++i) {
-    results += (i ? "," : "") + std::string("{\"content\":\"c") + std::to_string(i) +
-               "\",\"contentType\":\"" + types[i] + "\",\"properties\":{}}";
-  }
-  return "{\"queryId\":\"" + queryId + "\",\"quillmark\":{\"searchResult\":[" + results +
-         "],\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[]}}}";
-}
-
-inline void FakeTransport::answerEverything(Ms delay) {
-  setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {
-    reply.responseStr = replyBody(sent.id);
-    d = delay;
-    return true;
-  });
-}
 
 // A frame whose first plane has isolated bright dots on dark (many corners, sharpness > 0) or,
 // with `flat`, is uniform (no corners, sharpness 0). YUV frames get stride * height * 3 / 2
@@ -222,6 +202,84 @@ inline std::vector<uint8_t> makeFrame(int width, int height, int stride, int for
   }
   return bytes;
 }
+
+// A response handler that keeps copies of the responses it receives, then runs `onResponse`.
+class RecordingHandler : public Tovra::Server::ServerResponseHandler {
+ public:
+  void handleServerResponse(const Tovra::Server::ServerResponse& response) override {
+    {
+      std::lock_guard<std::mutex> lock(mutex_);
+      responses_.push_back(response);
+    }
+    if (onResponse) onResponse(response);
+  }
+  std::vector<Tovra::Server::ServerResponse> responses() const {
+    std::lock_guard<std::mutex> lock(mutex_);
+    return responses_;
+  }
+  size_t count() const { return responses().size(); }
+  std::function<void(const Tovra::Server::ServerResponse&)> onResponse;
+
+ private:
+  mutable std::mutex mutex_;
+  std::vector<Tovra::Server::ServerResponse> responses_;
+};
+
+inline Tovra::Server::ServerRequest makeRequest(const std::string& id, Tovra::Server::ServerResponseHandler* handler) {
+  Tovra::Server::ServerRequest request;
+  request.id = id;
+  request.responseHandler = handler;
+  return request;
+}
+
+inline Tovra::Server::ServerResponse makeResponse(const std::string& id, const std::string& body = "",
+                                                  int32_t code = 200, double roundtripTime = -1.0) {
+  Tovra::Server::ServerResponse response;
+  response.id = id;
+  response.responseStr = body;
+  response.responseCode = code;
+  response.roundtripTime = roundtripTime;
+  return response;
+}
+
+// A started engine wired to a recording delegate and transport, fed 64x48 frames of `format`:
+// textured, or uniform with `flat`.
+struct EngineRig {
+  explicit EngineRig(OrzaVSMobile::ImageFormat frameFormat = OrzaVSMobile::NV21)
+      : format(frameFormat), textured(makeFrame(64, 48, 64, format)), flat(makeFrame(64, 48, 64, format, true)),
+        engine(new Tovra::TovraStateEngine) {
+    engine->setEventDelegate(&events);
+    engine->addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
+    engine->startEngine();
+  }
+  OrzaVSMobile::ImageBuffer image(bool isFlat = false) {
+    return OrzaVSMobile::ImageBuffer(0, format, 64, 48, 64, 1, (isFlat ? flat : textured).data());
+  }
+  void frame(double t, bool isFlat = false) {
+    OrzaVSMobile::ImageBuffer pixels = image(isFlat);
+    OrzaVSMobile::ExtraFrameData extra;
+    extra.timeStamp = t;
+    engine->process("", pixels, extra);
+  }
+  bool jobIdle() { return waitFor([&] { return !engine->job(0).isBusy(); }); }
+  // Feeds a frame that the idle job sends; returns the request's id once the job awaits the reply
+  // (for a transport that does not answer at once).
+  std::string send(double t) {
+    EXPECT_TRUE(jobIdle());
+    const size_t before = transport.sentCount();
+    frame(t);
+    EXPECT_TRUE(waitFor([&] {
+      return transport.sentCount() == before + 1 && engine->job(0).state() == Tovra::AwaitingReply;
+    }));
+    return transport.sent().back().id;
+  }
+
+  RecordingEvents events;
+  FakeTransport transport;
+  const OrzaVSMobile::ImageFormat format;
+  std::vector<uint8_t> textured, flat;
+  std::unique_ptr<Tovra::TovraStateEngine> engine;  // last: destroyed before its delegates
+};
 
 }  // namespace orzavs_test
 

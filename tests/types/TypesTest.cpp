@@ -1,13 +1,26 @@
+// The value types: image buffers and their ownership rules, frame data, results, names, the
+// diagnostic output.
+
 #include "types/ImageBuffer.h"
 
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <map>
 #include <numeric>
+#include <string>
+#include <tuple>
+#include <type_traits>
 #include <vector>
 
+#include "exec/Job.h"
+#include "exec/TovraExecutionEngine.h"
 #include "types/ByteArray.h"
+#include "types/DiagnosticOutput.h"
+#include "types/EnumNames.h"
 #include "types/FrameData.h"
+#include "types/ObjectInfo.h"
+#include "types/ResultMetadata.h"
 
 using OrzaVSMobile::ImageBuffer;
 
@@ -19,9 +32,7 @@ std::vector<uint8_t> pattern(size_t n, uint8_t start) {
   return bytes;
 }
 
-std::vector<uint8_t> contents(const ImageBuffer& buffer, int n) {
-  return std::vector<uint8_t>(buffer.data, buffer.data + n);
-}
+std::vector<uint8_t> contents(const ImageBuffer& buffer, int n) { return {buffer.data, buffer.data + n}; }
 
 // Every fill operation with a real source of `n` bytes copies nothing.
 void expectEveryFillCopiesNothing(ImageBuffer& buffer, int32_t n) {
@@ -36,8 +47,7 @@ void expectEveryFillCopiesNothing(ImageBuffer& buffer, int32_t n) {
 TEST(ImageBufferTest, DefaultAndBorrowingBuffersCannotBeFilled) {
   ImageBuffer buffer;
   EXPECT_EQ(1, static_cast<int32_t>(buffer.format));
-  EXPECT_EQ(nullptr, buffer.data);
-  EXPECT_EQ(0, buffer.allocLen);
+  EXPECT_TRUE(buffer.data == nullptr && buffer.allocLen == 0);
   expectEveryFillCopiesNothing(buffer, 16);
   buffer.allocLen = 16;  // a forged allocLen on a null buffer cannot make a fill write
   expectEveryFillCopiesNothing(buffer, 16);
@@ -46,10 +56,8 @@ TEST(ImageBufferTest, DefaultAndBorrowingBuffersCannotBeFilled) {
   const std::vector<uint8_t> before = pixels;
   {
     ImageBuffer borrowed(5, OrzaVSMobile::GRAY, 8, 6, 10, 1, pixels.data());  // definition first
-    EXPECT_EQ(5, borrowed.definition);
-    EXPECT_EQ(OrzaVSMobile::GRAY, borrowed.format);
-    EXPECT_EQ(10, borrowed.widthStep);
-    EXPECT_EQ(-1, borrowed.knownLength());
+    EXPECT_EQ(std::make_tuple(5, OrzaVSMobile::GRAY, 10, int64_t{-1}),
+              std::make_tuple(borrowed.definition, borrowed.format, borrowed.widthStep, borrowed.knownLength()));
     expectEveryFillCopiesNothing(borrowed, 32);
     borrowed.releaseBuffer();  // frees nothing (ASan would report a bad free)
     EXPECT_EQ(pixels.data(), borrowed.data);
@@ -67,13 +75,11 @@ TEST(ImageBufferTest, FillsCopyAtMostTheOwnBlock) {
   const std::vector<uint8_t> other = pattern(40, 200);
   EXPECT_EQ(40, buffer.fillBufferWithByteBuffer(other.data(), 40));
   EXPECT_EQ(3 + 40, buffer.data[40]);  // bytes past the fill keep their earlier contents
-
   // Null sources and negative lengths copy nothing.
   EXPECT_EQ(0, buffer.fillBuffer(nullptr, 32));
   EXPECT_EQ(0, buffer.fillBuffer(src.data(), -5));
   EXPECT_EQ(0, buffer.fillBufferWithByteBuffer(src.data(), INT32_MIN));
   EXPECT_EQ(200, buffer.data[0]);
-
   // allocLen is a public field (settable from Java): a forged one never reaches past the block.
   buffer.allocLen = 1 << 20;
   EXPECT_EQ(100, buffer.fillBuffer(src.data(), 150));
@@ -92,7 +98,6 @@ TEST(ImageBufferTest, FailedReleasedAndEmptyBlocksForbidEveryFill) {
   buffer.releaseBuffer();  // nothing is freed twice
   buffer.allocLen = 64;    // without the guard the fill would be a use after free
   expectEveryFillCopiesNothing(buffer, 64);
-
   EXPECT_EQ(0, buffer.allocateBuffer(-1));
   EXPECT_EQ(0, buffer.allocLen);
   expectEveryFillCopiesNothing(buffer, 8);
@@ -104,8 +109,7 @@ TEST(ImageBufferTest, FailedReleasedAndEmptyBlocksForbidEveryFill) {
 TEST(ImageBufferTest, TwoPlaneFillPlacesTheSecondAfterTheFirstWithinTheBlock) {
   ImageBuffer buffer;
   ASSERT_EQ(150, buffer.allocateBuffer(150));
-  const std::vector<uint8_t> luma = pattern(200, 0);
-  const std::vector<uint8_t> chroma = pattern(200, 100);
+  const std::vector<uint8_t> luma = pattern(200, 0), chroma = pattern(200, 100);
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), 100, chroma.data(), 100));
   std::vector<uint8_t> expected(luma.begin(), luma.begin() + 100);
   expected.insert(expected.end(), chroma.begin(), chroma.begin() + 50);
@@ -113,7 +117,6 @@ TEST(ImageBufferTest, TwoPlaneFillPlacesTheSecondAfterTheFirstWithinTheBlock) {
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), 200, chroma.data(), 100));
   EXPECT_EQ(std::vector<uint8_t>(luma.begin(), luma.begin() + 150), contents(buffer, 150));
   EXPECT_EQ(0, buffer.fillBufferWithByteBuffer(luma.data(), 0, chroma.data(), 0));
-
   // A bad plane contributes nothing; the other is still bounded by the block.
   EXPECT_EQ(150, buffer.fillBufferWithByteBuffer(luma.data(), -20, chroma.data(), 200));
   EXPECT_EQ(100, buffer.data[0]);
@@ -146,10 +149,9 @@ TEST(ImageBufferTest, LentMemoryIsFilledWithinItsSizeAndNeverFreed) {
 TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer original(3, OrzaVSMobile::I420, 4, 4, 4, 1, nullptr);
   ASSERT_EQ(24, original.allocateBuffer(24));
-  const std::vector<uint8_t> src = pattern(24, 10);
+  const std::vector<uint8_t> src = pattern(24, 10), ones(24, 1), many = pattern(100, 1);
   ASSERT_EQ(24, original.fillBuffer(src.data(), 24));
-  ImageBuffer copy(original);
-  ImageBuffer assigned;
+  ImageBuffer copy(original), assigned;
   ASSERT_EQ(8, assigned.allocateBuffer(8));  // replaced (and freed) by the assignment
   assigned = original;
   for (ImageBuffer* duplicate : {&copy, &assigned}) {
@@ -157,7 +159,6 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
     EXPECT_EQ(3, duplicate->definition);
     EXPECT_EQ(src, contents(*duplicate, 24));
   }
-  const std::vector<uint8_t> ones(24, 1);
   original.releaseBuffer();  // the copies outlive the original's block
   ASSERT_EQ(24, assigned.fillBuffer(ones.data(), 24));
   ImageBuffer& alias = assigned;
@@ -165,14 +166,13 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   EXPECT_EQ(ones, contents(assigned, 24));
 
   std::vector<uint8_t> pixels(40, 0);
-  ImageBuffer lent;
+  ImageBuffer lent, lentCopy;
   lent.lend(pixels.data(), 40);
-  ImageBuffer lentCopy;
   lentCopy = lent;
   EXPECT_EQ(pixels.data(), lentCopy.data);
   lentCopy.allocLen = 4000;
   EXPECT_EQ(24, lentCopy.fillBuffer(src.data(), 24));
-  EXPECT_EQ(40, lentCopy.fillBuffer(pattern(100, 1).data(), 100));
+  EXPECT_EQ(40, lentCopy.fillBuffer(many.data(), 100));
 
   ImageBuffer released;
   ASSERT_EQ(16, released.allocateBuffer(16));
@@ -180,7 +180,6 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer releasedCopy(released);
   releasedCopy.allocLen = 16;
   expectEveryFillCopiesNothing(releasedCopy, 16);
-
   // A block whose allocLen was zeroed is still duplicated: a forged allocLen on the copy
   // cannot reach the original's memory.
   ImageBuffer zeroed;
@@ -189,30 +188,81 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer zeroedCopy(zeroed);
   EXPECT_NE(zeroed.data, zeroedCopy.data);
   zeroedCopy.allocLen = 100;
-  EXPECT_EQ(12, zeroedCopy.fillBuffer(pattern(100, 1).data(), 100));
+  EXPECT_EQ(12, zeroedCopy.fillBuffer(many.data(), 100));
 }
 
-TEST(ImageBufferTest, OnlyFormatValuesZeroToTwoAreYuv) {
+TEST(FrameDataTest, YuvFormatsByteArraysAndDefaults) {
   for (int32_t format : {0, 1, 2}) EXPECT_TRUE(OrzaVSMobile::isYUVFormat(format));
   for (int32_t format : {3, 4, 7, -1, INT32_MIN, 1000}) EXPECT_FALSE(OrzaVSMobile::isYUVFormat(format));
-}
-
-TEST(FrameDataTest, ByteArraysShareTheBytesAndDefaultsMeanUnknown) {
   uint8_t bytes[5] = {1, 2, 3, 4, 5};
   {
     OrzaVSMobile::ByteArray array(bytes, 5);
-    OrzaVSMobile::ByteArray copy(array);
+    OrzaVSMobile::ByteArray copy(array);  // shares the bytes
     copy.getData()[0] = 9;
     copy.clear();
     EXPECT_EQ(nullptr, copy.getData());
     EXPECT_EQ(5, array.getLength());
   }  // stack memory: freeing it would be reported by ASan
   EXPECT_EQ(9, bytes[0]);
+  const OrzaVSMobile::ExtraFrameData extra;  // -1 means unknown
+  EXPECT_EQ(std::make_tuple(-1, -1, false, 0, -1.0),
+            std::make_tuple(extra.displayROI.x, extra.focusROI.height, extra.flat, extra.screenOrient, extra.timeStamp));
+}
 
-  OrzaVSMobile::ExtraFrameData extra;
-  EXPECT_EQ(-1, extra.displayROI.x);
-  EXPECT_EQ(-1, extra.focusROI.height);
-  EXPECT_FALSE(extra.flat);
-  EXPECT_EQ(0, extra.screenOrient);
-  EXPECT_EQ(-1.0, extra.timeStamp);
+using Tovra::ObjectInfo;
+using Tovra::ResultMetadata;
+
+// Every enumeration that crosses JNI has a fixed 32-bit underlying type, so any integer that
+// arrives from Java is a valid value of the type.
+template <typename... E>
+constexpr bool allInt32 = (std::is_same<typename std::underlying_type<E>::type, int32_t>::value && ...);
+static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionID, Tovra::StatusID,
+                       Tovra::CameraStabilityIssue, Tovra::JudgeVerdictOnModule, Tovra::Server::ResponseStatus,
+                       OrzaVSMobile::ImageFormat, Tovra::JobState>, "");
+
+TEST(ResultsTest, DefaultsAndAMetadataClearThatEqualsAFreshOne) {
+  const ObjectInfo info, qr(Tovra::QR_CODE);
+  EXPECT_EQ(6, info.srcObjectModule);
+  EXPECT_EQ(11, info.contentType);
+  EXPECT_TRUE(info.content.empty() && info.properties.empty() && info.subContents.empty() && info.location.empty());
+  EXPECT_EQ(2, qr.contentType);
+  EXPECT_EQ(6, qr.srcObjectModule);
+  ResultMetadata metadata;
+  metadata.isFinalAccumulation = true;
+  metadata.queryID = "q";
+  metadata.mobileDecorator = "TeskarMobileDecorator";
+  metadata.accumulatedQueries.assign(10, "q");
+  metadata.clear();
+  EXPECT_FALSE(metadata.isFinalAccumulation);
+  EXPECT_TRUE(metadata.queryID.empty() && metadata.mobileDecorator.empty() && metadata.accumulatedQueries.empty());
+  const ResultMetadata fresh;
+  EXPECT_TRUE(!fresh.isFinalAccumulation && fresh.queryID.empty() && fresh.accumulatedQueries.empty());
+}
+
+TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {
+#define ORZAVS_NAMED(e) {Tovra::e, #e}
+  const std::map<Tovra::ObjectModuleID, std::string> modules = {
+      ORZAVS_NAMED(BARCODE_MOD), ORZAVS_NAMED(VISUAL_SEARCH_SERVICE_MOD), ORZAVS_NAMED(TWOD_BARCODE_MOD),
+      ORZAVS_NAMED(PACKAGE_LABEL_MOD), ORZAVS_NAMED(GIFTCARD_MOD), ORZAVS_NAMED(UNSPECIFIED_OBJECT_MOD),
+      ORZAVS_NAMED(NUM_OBJECT_MODS)};
+  const std::map<Tovra::ContentType, std::string> contents = {
+      ORZAVS_NAMED(BARCODE_UPC_EAN), ORZAVS_NAMED(BARCODE_128), ORZAVS_NAMED(QR_CODE), ORZAVS_NAMED(DATA_MATRIX),
+      ORZAVS_NAMED(PDF_417), ORZAVS_NAMED(GIFT_CARD), ORZAVS_NAMED(PIDN), ORZAVS_NAMED(SEARCH_TERMS),
+      ORZAVS_NAMED(DIRECTED_RESULT), ORZAVS_NAMED(EXTERNAL_RESULT), ORZAVS_NAMED(UNSPECIFIED_CONTENT_TYPE),
+      ORZAVS_NAMED(NUM_CONTENT_TYPES)};
+#undef ORZAVS_NAMED
+  EXPECT_EQ(modules, Tovra::ObjectModuleIDNames);
+  EXPECT_EQ(contents, Tovra::ContentTypeNames);
+}
+
+TEST(Diagnostics, DefaultSinkWritesEachLineAndANewlineToStandardOutput) {
+  const std::string reply(300, 'x');  // past the formatting buffer of short lines
+  testing::internal::CaptureStdout();
+  Tovra::TovraExecutionEngine none(0);
+  OrzaVSMobile::reportLinef("VSS SERVER ERROR: response: %s", reply.c_str());
+  OrzaVSMobile::reportLinef("Skipped input frame: invalid image size %dx%d", -1, 0);
+  EXPECT_EQ(testing::internal::GetCapturedStdout(),
+            "Initialized TovraExecutionEngine with invalid number of threads\n"
+            "VSS SERVER ERROR: response: " + reply + "\n"
+            "Skipped input frame: invalid image size -1x0\n");
 }

@@ -68,7 +68,7 @@ class EngineEndToEndTest {
     }
   }
 
-  /** A transport that answers from its own thread with a reply chosen by the test. */
+  /** A transport that answers REPLY from a thread of its own, or at once on the caller's. */
   static class Transport extends ServerDelegate {
     final ExecutorService executor = Executors.newSingleThreadExecutor(r -> {
       Thread t = new Thread(r, "transport");
@@ -77,20 +77,16 @@ class EngineEndToEndTest {
     });
     final LinkedBlockingQueue<String> sent = new LinkedBlockingQueue<String>();
     final LinkedBlockingQueue<Throwable> pushFailures = new LinkedBlockingQueue<Throwable>();
-    volatile int code = 200;
-    volatile String body = REPLY;
-    volatile RuntimeException throwOnSend;
     volatile boolean answerAtOnce;
     volatile boolean answerThroughHandler;
 
     @Override
     public boolean sendServerRequestImpl(ServerRequest request) {
-      if (throwOnSend != null) throw throwOnSend;
       if (answerAtOnce || answerThroughHandler) {
         // Answer on the calling thread (the engine's worker), before returning.
         ServerResponse response = new ServerResponse();
         response.setId(request.getId());
-        response.setResponseStr(body);
+        response.setResponseStr(REPLY);
         sent.add(request.getId() + "|at once|" + Thread.currentThread().getName());
         if (answerThroughHandler) {
           request.getResponseHandler().handleServerResponse(response);
@@ -105,13 +101,10 @@ class EngineEndToEndTest {
       boolean hasParams = request.getParams().has_key("vsearch_params_json");
       sent.add(id + "|" + (jpeg.length > 2 && (jpeg[0] & 0xff) == 0xff && (jpeg[1] & 0xff) == 0xd8)
           + "|" + hasParams + "|" + Thread.currentThread().getName());
-      final int replyCode = code;
-      final String replyBody = body;
       executor.execute(() -> {
         ServerResponse response = new ServerResponse();
         response.setId(id);
-        response.setResponseCode(replyCode);
-        response.setResponseStr(replyBody);
+        response.setResponseStr(REPLY);
         response.setRoundtripTime(0.01);
         try {
           pushServerResponse(response);
@@ -219,15 +212,8 @@ class EngineEndToEndTest {
     assertTrue(events.lastPointCount > 0 && events.lastPointCount <= 50,
         "points: " + events.lastPointCount);
 
-    // A failed exchange reaches the delegate as a server error.
-    transport.code = 500;
-    transport.body = "internal error";
-    streamUntilSent();
-    assertEquals("transport|error VISUAL_SEARCH_SERVICE_MOD RESPONSE_SERVER_ERROR 500", nextEvent());
-
+    // (A failed exchange as a server error: EngineOverHttpTest, over HTTP.)
     // A failing didDecode: the transport's pushServerResponse throws that very exception.
-    transport.code = 200;
-    transport.body = REPLY;
     events.throwFromDecode = new IllegalStateException("app failure", new Error("cause"));
     streamUntilSent();
     assertSame(events.throwFromDecode, transport.pushFailures.poll(10, TimeUnit.SECONDS));
@@ -264,24 +250,6 @@ class EngineEndToEndTest {
     own.setHeight(HEIGHT * 4);
     engine.process(own, extra);
     assertEquals(1, events.pointThreads.size());
-  }
-
-  @Test
-  void aThrowingTransportDoesNotStopTheEngine() throws Exception {
-    LinkedBlockingQueue<Throwable> handled = new LinkedBlockingQueue<Throwable>();
-    OrzaVSMobile.setCallbackExceptionHandler((thread, e) -> handled.add(e));
-    try {
-      engine.startEngine();
-      transport.throwOnSend = new IllegalStateException("offline");
-      streamFrame();
-      // On the worker no Java caller waits: the application's handler gets the exception.
-      assertSame(transport.throwOnSend, handled.poll(10, TimeUnit.SECONDS));
-      transport.throwOnSend = null;
-      streamUntilSent();
-      assertTrue(nextEvent().startsWith("transport|q-1|"));
-    } finally {
-      OrzaVSMobile.setCallbackExceptionHandler(null);
-    }
   }
 
   @Test

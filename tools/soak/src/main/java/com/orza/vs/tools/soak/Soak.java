@@ -22,10 +22,10 @@ import java.util.Collections;
 import java.util.List;
 import java.util.Locale;
 import java.util.Random;
+import java.util.concurrent.RejectedExecutionException;
 import java.util.concurrent.ScheduledExecutorService;
 import java.util.concurrent.ScheduledThreadPoolExecutor;
 import java.util.concurrent.TimeUnit;
-import java.util.concurrent.RejectedExecutionException;
 import java.util.concurrent.atomic.AtomicLong;
 import java.util.concurrent.atomic.AtomicLongArray;
 import java.util.concurrent.locks.ReentrantReadWriteLock;
@@ -46,7 +46,7 @@ import java.util.concurrent.locks.ReentrantReadWriteLock;
  * <p>The job starts waiting before its request reaches the transport: it is registered under the
  * request's id, then the upcall is made. A late reply pushed in between (a long time under
  * emulation) ends the wait of a request the transport has not seen yet. So the soak follows the
- * job's wait itself rather than sampling a clock when a request arrives: {@link #awaited} is the
+ * job's wait itself rather than reading a counter when a request arrives: {@link #awaited} is the
  * request it waits for, cleared by a callback or a finished reset; a callback while no seen
  * request is awaited ended the wait of the request being handed over, which then arrives with
  * its wait already over. Resets take {@link #resetLock} for writing and frame calls for reading,
@@ -662,8 +662,8 @@ public final class Soak {
             + "request reached the transport %d); lost %d, duplicated %d, outside a push %d, "
             + "double dispatch %d, after stop %d; %d requests left unanswered at the end%n",
         counters.pushes.get(), counters.pushesRightId.get(), counters.decodes.get(), counters.serverErrors.get(),
-        counters.excusedSilent.get(), counters.endedOnTheWay.get(), counters.lost.get(), counters.duplicated.get(), counters.unattributed.get(),
-        counters.doubleDispatch.get(), counters.afterStop.get(), left.size());
+        counters.excusedSilent.get(), counters.endedOnTheWay.get(), counters.lost.get(), counters.duplicated.get(),
+        counters.unattributed.get(), counters.doubleDispatch.get(), counters.afterStop.get(), left.size());
     REPORT.printf(Locale.ROOT, "soak: samples %d (early window %.0f-%.0f s: %d, late window from %.0f s: %d)%n",
         samples.size(), earlyFrom, earlyTo, early.size(), lateFrom, late.size());
     REPORT.printf(Locale.ROOT, "soak: resident memory   early %.1f MB, late %.1f MB%n", rssEarly, rssLate);

@@ -86,7 +86,8 @@ public final class Recognizer {
       else System.loadLibrary(Core.NATIVE_LIBRARY_NAME);
     } catch (UnsatisfiedLinkError e) {
       UnsatisfiedLinkError hint = new UnsatisfiedLinkError("cannot load OpenCV's Java library ("
-          + e.getMessage() + "); install libopencv406-jni (scripts/install-deps.sh)");
+          + e.getMessage() + "); install libopencv406-jni (scripts/install-deps.sh), or search through a reference "
+          + "server elsewhere: ORZAVS_RECOGNIZER=http://HOST:PORT/recognize");
       hint.initCause(e);
       throw hint;
     }

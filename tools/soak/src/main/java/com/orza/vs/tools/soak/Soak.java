@@ -556,7 +556,8 @@ public final class Soak {
 
   private static Sample sample(double t) {
     Resources.gc();
-    return new Sample(t, Resources.rssKb(), Resources.heapUsedKb(), Resources.threadCount());
+    long heapKb = Resources.heapUsedKb();  // before reading /proc, whose text is garbage
+    return new Sample(t, Resources.rssKb(), heapKb, Resources.threadCount());
   }
 
   private static double median(List<Sample> window, java.util.function.ToLongFunction<Sample> f) {

@@ -22,8 +22,14 @@ import javax.management.ObjectName;
 final class Resources {
   private Resources() {}
 
-  /** VmRSS of this process, in kB (from /proc/self/status); -1 where there is no /proc. */
+  /**
+   * Resident memory of this process in kB; -1 where there is no /proc. A 32-bit JVM counts the
+   * mappings below 4 GiB (/proc/self/smaps): on a 32-bit system that is all of them, and under a
+   * user-mode emulator on a 64-bit machine it leaves out the emulator's own memory above, whose
+   * translation cache grows with every piece of code the JIT emits. Otherwise VmRSS.
+   */
   static long rssKb() {
+    if ("32".equals(System.getProperty("sun.arch.data.model"))) return rssBelow4GiBKb();
     try {
       List<String> lines = Files.readAllLines(Paths.get("/proc/self/status"), StandardCharsets.UTF_8);
       for (String line : lines) {
@@ -33,6 +39,25 @@ final class Resources {
       // fall through
     }
     return -1;
+  }
+
+  private static final java.util.regex.Pattern MAPPING = java.util.regex.Pattern.compile("[0-9a-f]+-[0-9a-f]+ ");
+
+  private static long rssBelow4GiBKb() {
+    try {
+      long kb = 0;
+      boolean counted = false;
+      for (String line : Files.readAllLines(Paths.get("/proc/self/smaps"), StandardCharsets.UTF_8)) {
+        if (MAPPING.matcher(line).lookingAt()) {  // "start-end perms ...": a mapping begins
+          counted = Long.parseUnsignedLong(line.substring(0, line.indexOf('-')), 16) < (1L << 32);
+        } else if (counted && line.startsWith("Rss:")) {
+          kb += Long.parseLong(line.replaceAll("[^0-9]", ""));
+        }
+      }
+      return kb;
+    } catch (IOException | NumberFormatException e) {
+      return -1;
+    }
   }
 
   /** Collects garbage until the used heap stops shrinking (at most a few rounds). */

@@ -22,12 +22,13 @@ import java.util.Collections;
 import java.util.List;
 import java.util.Locale;
 import java.util.Random;
+import java.util.concurrent.RejectedExecutionException;
 import java.util.concurrent.ScheduledExecutorService;
 import java.util.concurrent.ScheduledThreadPoolExecutor;
 import java.util.concurrent.TimeUnit;
 import java.util.concurrent.atomic.AtomicLong;
 import java.util.concurrent.atomic.AtomicLongArray;
-import java.util.concurrent.RejectedExecutionException;
+import java.util.concurrent.locks.ReentrantReadWriteLock;
 
 /**
  * A long run of the library through its Java binding, as an app uses it, with an unreliable
@@ -38,13 +39,24 @@ import java.util.concurrent.RejectedExecutionException;
  *
  * <p>Accounting. Every reply is pushed from one thread, and a result callback (didDecode or
  * didReceiveServerError) runs inside the push that caused it, so each callback is attributed to
- * its push. The engine's job waits for one reply at a time; a reset (pause, stop, start from
+ * its push. The engine's one job waits for one reply at a time; a reset (pause, stop, start from
  * paused) ends that wait, and so does a callback, even one caused by a late reply to an earlier
- * request (the job takes whatever reply reaches it while it waits). Hence the rules checked:
- * a push causes at most one callback; no callback happens outside a push; a push of the right
- * id that causes none must be explained by a reset or a callback since its request was sent;
- * no request is sent while the job still waits undisturbed for the previous one; and once the
- * engine is stopped, or deleted, no push causes a callback.
+ * request (the job takes whatever reply reaches it while it waits).
+ *
+ * <p>The job starts waiting before its request reaches the transport: it is registered under the
+ * request's id, then the upcall is made. A late reply pushed in between (a long time under
+ * emulation) ends the wait of a request the transport has not seen yet. So the soak follows the
+ * job's wait itself rather than reading a counter when a request arrives: {@link #awaited} is the
+ * request it waits for, cleared by a callback or a finished reset; a callback while no seen
+ * request is awaited ended the wait of the request being handed over, which then arrives with
+ * its wait already over. Resets take {@link #resetLock} for writing and frame calls for reading,
+ * so no frame can start a new wait between a reset and its bookkeeping.
+ *
+ * <p>Hence the rules checked: a push causes at most one callback; no callback happens outside a
+ * push, nor while the job waits for nothing; a push of the right id that causes none while its
+ * request is still awaited and no reset is under way is a lost reply; no request is sent while
+ * the job still waits for the previous one; and once the engine is stopped, or deleted, no push
+ * causes a callback.
  *
  * <p>Resources. Resident memory (/proc/self/status), Java heap after garbage collection, live
  * threads, and JNI global references (counted as the "JNI global" roots of a heap dump) are
@@ -88,9 +100,6 @@ public final class Soak {
   // that the two never interleave within a line.
   private static final java.io.PrintStream REPORT = System.err;
 
-  // Incremented around every engine reset and by every result callback: a request's wait ends
-  // only through one of them.
-  private final AtomicLong disturbance = new AtomicLong();
   private final Counters counters = new Counters();
   private final List<String> failures = Collections.synchronizedList(new ArrayList<String>());
   private final Random random = new Random(20240601L);
@@ -99,8 +108,14 @@ public final class Soak {
   private volatile boolean forceAnswer;
   private volatile boolean stopped;
   private volatile boolean deleted;
+  private final ReentrantReadWriteLock resetLock = new ReentrantReadWriteLock();
+  // The job's wait, as the callbacks, resets and requests show it (guarded by sendLock).
   private final Object sendLock = new Object();
-  private long lastSendDisturbance = -1;
+  /** The request the job waits for; null when its last wait has ended. */
+  private String awaited;
+  /** Callbacks that ended the wait of a request the transport had not received yet (0 or 1). */
+  private int earlyCallbacks;
+  private int resetsUnderWay;
   private final List<String> outstanding = new ArrayList<>();
 
   private Events events;
@@ -119,6 +134,7 @@ public final class Soak {
     final AtomicLong decodes = new AtomicLong();
     final AtomicLong serverErrors = new AtomicLong();
     final AtomicLong excusedSilent = new AtomicLong();
+    final AtomicLong endedOnTheWay = new AtomicLong();
     final AtomicLong lost = new AtomicLong();
     final AtomicLong duplicated = new AtomicLong();
     final AtomicLong unattributed = new AtomicLong();
@@ -186,7 +202,13 @@ public final class Soak {
     }
 
     private Push attribute() {
-      disturbance.incrementAndGet();
+      synchronized (sendLock) {
+        if (awaited != null) {
+          awaited = null;
+        } else if (++earlyCallbacks > 1) {
+          fail("a result callback while the job waited for no request");
+        }
+      }
       Push push = CURRENT_PUSH.get();
       if (push == null) {
         counters.unattributed.incrementAndGet();
@@ -210,13 +232,18 @@ public final class Soak {
           fail("request " + id + " does not carry a JPEG");
         }
         if (!request.getParams().has_key("vsearch_params_json")) fail("request " + id + " without parameters");
-        final long sentAt = disturbance.get();
         synchronized (sendLock) {
-          if (lastSendDisturbance == sentAt) {
+          if (awaited != null) {
             counters.doubleDispatch.incrementAndGet();
-            fail("request " + id + " sent while the job still waited for the previous one");
+            fail("request " + id + " sent while the job still waited for " + awaited);
           }
-          lastSendDisturbance = sentAt;
+          if (earlyCallbacks > 0) {
+            earlyCallbacks = 0;  // a late reply ended this wait before the request got here
+            counters.endedOnTheWay.incrementAndGet();
+            awaited = null;
+          } else {
+            awaited = id;
+          }
           outstanding.add(id);
         }
         counters.sends.incrementAndGet();
@@ -232,7 +259,7 @@ public final class Soak {
           pusher.schedule(new Runnable() {
             @Override
             public void run() {
-              answer(id, fate, sentAt);
+              answer(id, fate);
             }
           }, delayMs, TimeUnit.MILLISECONDS);
         } catch (RejectedExecutionException e) {
@@ -261,7 +288,7 @@ public final class Soak {
   }
 
   /** Runs on the pusher thread: the reply for request {@code id}, as its fate says. */
-  private void answer(String id, Fate fate, long sentAt) {
+  private void answer(String id, Fate fate) {
     String queryId = "soak-" + counters.pushes.get();
     int code = 200;
     String body;
@@ -276,12 +303,14 @@ public final class Soak {
       if (push.callbacks != 0) fail("a reply with an unknown id caused a callback");
       return;
     }
+    boolean stillAwaited;
     synchronized (sendLock) {
       outstanding.remove(id);
+      stillAwaited = id.equals(awaited) && resetsUnderWay == 0;
     }
     counters.pushesRightId.incrementAndGet();
     if (push.callbacks == 0) {
-      if (disturbance.get() == sentAt && !stopped) {
+      if (stillAwaited && !stopped) {
         counters.lost.incrementAndGet();
         fail("reply " + id + " (" + fate + ") caused no callback though the job waited undisturbed");
       } else {
@@ -408,7 +437,12 @@ public final class Soak {
       chroma.put(pixels, WIDTH * HEIGHT, WIDTH * HEIGHT / 2);
       int copied = image.fillBufferWithByteBuffer(luma, WIDTH * HEIGHT, chroma, WIDTH * HEIGHT / 2);
       if (copied != pixels.length) fail("lent buffer took " + copied + " of " + pixels.length + " bytes");
-      engine.process(key[0], image, extra);
+      resetLock.readLock().lock();
+      try {
+        engine.process(key[0], image, extra);
+      } finally {
+        resetLock.readLock().unlock();
+      }
       counters.lentFrames.incrementAndGet();
     }
   }
@@ -441,17 +475,38 @@ public final class Soak {
       if (n % 41 == 0) image.setWidthStep(WIDTH / 2);
       if (n % 43 == 0) image.setFormat(ImageFormat.BGRA);
       if (n % 37 == 0 || n % 41 == 0 || n % 43 == 0) counters.badFrames.incrementAndGet();
-      engine.process(image, extra);
+      resetLock.readLock().lock();
+      try {
+        engine.process(image, extra);
+      } finally {
+        resetLock.readLock().unlock();
+      }
     }
   }
 
   // --- Engine control --------------------------------------------------------------------
 
+  /**
+   * An engine reset: it ends the job's wait. Frames are held off until the wait is noted as
+   * ended, or a fresh start could let the job begin a new one first.
+   */
   private void reset(Runnable action) {
-    disturbance.incrementAndGet();
-    action.run();
-    disturbance.incrementAndGet();
-    counters.resets.incrementAndGet();
+    resetLock.writeLock().lock();
+    try {
+      synchronized (sendLock) {
+        ++resetsUnderWay;
+      }
+      action.run();
+      synchronized (sendLock) {
+        --resetsUnderWay;
+        awaited = null;
+        if (earlyCallbacks > 0) fail("a result callback while the job waited for no request");
+        earlyCallbacks = 0;
+      }
+      counters.resets.incrementAndGet();
+    } finally {
+      resetLock.writeLock().unlock();
+    }
   }
 
   private void controlStep(ImageBuffer still, ExtraFrameData stillExtra) throws InterruptedException {
@@ -501,7 +556,8 @@ public final class Soak {
 
   private static Sample sample(double t) {
     Resources.gc();
-    return new Sample(t, Resources.rssKb(), Resources.heapUsedKb(), Resources.threadCount());
+    long heapKb = Resources.heapUsedKb();  // before reading /proc, whose text is garbage
+    return new Sample(t, Resources.rssKb(), heapKb, Resources.threadCount());
   }
 
   private static double median(List<Sample> window, java.util.function.ToLongFunction<Sample> f) {
@@ -603,11 +659,12 @@ public final class Soak {
     REPORT.printf(Locale.ROOT, "soak: requests sent %d; fates:%s%n", counters.sends.get(), fates);
     REPORT.printf(Locale.ROOT,
         "soak: replies pushed %d (%d with the request's id); callbacks: %d didDecode, %d didReceiveServerError; "
-            + "silent pushes explained by a reset or an earlier reply %d; lost %d, duplicated %d, outside a push %d, "
+            + "silent pushes explained by a reset or an earlier reply %d (waits ended by a late reply before their "
+            + "request reached the transport %d); lost %d, duplicated %d, outside a push %d, "
             + "double dispatch %d, after stop %d; %d requests left unanswered at the end%n",
         counters.pushes.get(), counters.pushesRightId.get(), counters.decodes.get(), counters.serverErrors.get(),
-        counters.excusedSilent.get(), counters.lost.get(), counters.duplicated.get(), counters.unattributed.get(),
-        counters.doubleDispatch.get(), counters.afterStop.get(), left.size());
+        counters.excusedSilent.get(), counters.endedOnTheWay.get(), counters.lost.get(), counters.duplicated.get(),
+        counters.unattributed.get(), counters.doubleDispatch.get(), counters.afterStop.get(), left.size());
     REPORT.printf(Locale.ROOT, "soak: samples %d (early window %.0f-%.0f s: %d, late window from %.0f s: %d)%n",
         samples.size(), earlyFrom, earlyTo, early.size(), lateFrom, late.size());
     REPORT.printf(Locale.ROOT, "soak: resident memory   early %.1f MB, late %.1f MB%n", rssEarly, rssLate);

@@ -30,6 +30,14 @@ import org.opencv.features2d.ORB;
  *
  * <p>The index is built once; {@link #find} is serialised (OpenCV's matcher objects are not
  * shared between threads).
+ *
+ * <p>Where OpenCV's Java library does not exist for the JVM (Debian ships it for some
+ * architectures only, and a 32-bit ARM JVM under emulation is one without it), the search can
+ * run in another process: with the system property {@code orzavs.recognizer}, or else the
+ * environment variable {@code ORZAVS_RECOGNIZER}, naming a reference server's
+ * {@code /recognize} address, each frame's luminance goes there and the product comes back
+ * ({@link RemoteRecognizer}). The answer is the one this class would give locally, since the
+ * search starts from that same luminance.
  */
 public final class Recognizer {
   /** Longest side of a product image as it is indexed, and of a query frame as it is searched. */
@@ -78,7 +86,8 @@ public final class Recognizer {
       else System.loadLibrary(Core.NATIVE_LIBRARY_NAME);
     } catch (UnsatisfiedLinkError e) {
       UnsatisfiedLinkError hint = new UnsatisfiedLinkError("cannot load OpenCV's Java library ("
-          + e.getMessage() + "); install libopencv406-jni (scripts/install-deps.sh)");
+          + e.getMessage() + "); install libopencv406-jni (scripts/install-deps.sh), or search through a reference "
+          + "server elsewhere: ORZAVS_RECOGNIZER=http://HOST:PORT/recognize");
       hint.initCause(e);
       throw hint;
     }
@@ -105,17 +114,28 @@ public final class Recognizer {
   private final FlannBasedMatcher matcher;
   private final ORB queryOrb;
   private final Catalog catalog;
+  /** Non-null when the search runs in another process; the fields above are then unused. */
+  private final RemoteRecognizer remote;
 
   public Recognizer(Catalog catalog) throws IOException {
-    loadOpenCv();
     this.catalog = catalog;
+    String url = System.getProperty("orzavs.recognizer", System.getenv("ORZAVS_RECOGNIZER"));
+    if (url != null && !url.isEmpty()) {
+      remote = new RemoteRecognizer(url, catalog);
+      owner = null;
+      matcher = null;
+      queryOrb = null;
+      return;
+    }
+    remote = null;
+    loadOpenCv();
     ORB orb = orb(PRODUCT_FEATURES);
     List<Mat> descriptors = new ArrayList<>();
     List<Integer> owners = new ArrayList<>();
     int rows = 0;
     for (Catalog.Product p : catalog.products) {
       double scale = Math.min(1.0, (double) PRODUCT_SIDE / Math.max(p.image.getWidth(), p.image.getHeight()));
-      Mat grey = grey(p.image, scale);
+      Mat grey = grey(luminance(p.image), p.image.getWidth(), p.image.getHeight(), scale);
       MatOfKeyPoint kp = new MatOfKeyPoint();
       Mat d = new Mat();
       orb.detectAndCompute(grey, new Mat(), kp, d);
@@ -157,7 +177,7 @@ public final class Recognizer {
   static boolean indexable(BufferedImage img) {
     loadOpenCv();
     double scale = Math.min(1.0, (double) PRODUCT_SIDE / Math.max(img.getWidth(), img.getHeight()));
-    Mat grey = grey(img, scale);
+    Mat grey = grey(luminance(img), img.getWidth(), img.getHeight(), scale);
     MatOfKeyPoint kp = new MatOfKeyPoint();
     orb(PRODUCT_FEATURES).detect(grey, kp);
     grey.release();
@@ -168,7 +188,14 @@ public final class Recognizer {
 
   /** Products that could be indexed (those with enough texture). */
   public int indexedProducts() {
-    return indexed.size();
+    return remote != null ? remote.indexedProducts() : indexed.size();
+  }
+
+  /** The ids of the products that could be indexed. */
+  List<String> indexedIds() {
+    List<String> ids = new ArrayList<>();
+    for (Indexed p : indexed) ids.add(p.product.id);
+    return ids;
   }
 
   public Catalog catalog() {
@@ -205,8 +232,8 @@ public final class Recognizer {
     }
   }
 
-  /** The image's luminance as an 8-bit matrix, scaled by {@code scale} (at most 1). */
-  static Mat grey(BufferedImage img, double scale) {
+  /** The image's luminance, one byte a pixel, row after row. */
+  static byte[] luminance(BufferedImage img) {
     int w = img.getWidth(), h = img.getHeight();
     int[] rgb = img.getRGB(0, 0, w, h, null, 0, w);
     byte[] y = new byte[w * h];
@@ -214,6 +241,11 @@ public final class Recognizer {
       int p = rgb[i];
       y[i] = (byte) ((77 * ((p >> 16) & 255) + 150 * ((p >> 8) & 255) + 29 * (p & 255) + 128) >> 8);
     }
+    return y;
+  }
+
+  /** A w x h luminance plane as an 8-bit matrix, scaled by {@code scale} (at most 1). */
+  static Mat grey(byte[] y, int w, int h, double scale) {
     Mat m = new Mat(h, w, CvType.CV_8UC1);
     m.put(0, 0, y);
     if (scale >= 1.0) return m;
@@ -229,14 +261,21 @@ public final class Recognizer {
    * is found is searched once more at half the size, where motion blur spans half as many
    * pixels and the corner detector finds the edges it smeared.
    */
-  public synchronized Match find(BufferedImage frame) {
-    double scale = Math.min(1.0, (double) QUERY_SIDE / Math.max(frame.getWidth(), frame.getHeight()));
-    Match m = find(frame, scale);
-    return m != null ? m : find(frame, scale / 2);
+  public Match find(BufferedImage frame) {
+    byte[] y = luminance(frame);
+    if (remote != null) return remote.find(y, frame.getWidth(), frame.getHeight());
+    return find(y, frame.getWidth(), frame.getHeight());
   }
 
-  private Match find(BufferedImage frame, double scale) {
-    Mat grey = grey(frame, scale);
+  /** {@link #find(BufferedImage)} for a frame given as its w x h luminance plane. */
+  synchronized Match find(byte[] y, int w, int h) {
+    double scale = Math.min(1.0, (double) QUERY_SIDE / Math.max(w, h));
+    Match m = find(y, w, h, scale);
+    return m != null ? m : find(y, w, h, scale / 2);
+  }
+
+  private Match find(byte[] y, int frameW, int frameH, double scale) {
+    Mat grey = grey(y, frameW, frameH, scale);
     MatOfKeyPoint kp = new MatOfKeyPoint();
     Mat d = new Mat();
     queryOrb.detectAndCompute(grey, new Mat(), kp, d);
@@ -269,7 +308,7 @@ public final class Recognizer {
     for (int c = 0; c < Math.min(CANDIDATES, order.length); c++) {
       List<int[]> pairs = byProduct.get(order[c]);
       if (pairs.size() < MIN_MATCHES) break;
-      Match m = verify(indexed.get(order[c]), pairs, kps, scale, frame.getWidth(), frame.getHeight());
+      Match m = verify(indexed.get(order[c]), pairs, kps, scale, frameW, frameH);
       if (m != null && (best == null || m.inliers > best.inliers)) best = m;
     }
     return best;

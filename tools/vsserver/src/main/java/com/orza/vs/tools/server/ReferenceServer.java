@@ -44,6 +44,8 @@ import javax.imageio.stream.ImageInputStream;
  * answers 500, {@code /test/notjson} answers 200 with a body that is not JSON, and
  * {@code /test/slow/<ms>} waits that long (at most a minute) before answering normally. The
  * options {@code delayMs} and {@code fail} apply the same behaviour to {@code /vsearch}.
+ * {@code /recognize} does the product search alone for a server in another JVM
+ * ({@link RemoteRecognizer}).
  */
 public final class ReferenceServer implements AutoCloseable {
   /** Frames larger than this many pixels are refused before decoding (decompression bombs). */
@@ -228,6 +230,7 @@ public final class ReferenceServer implements AutoCloseable {
       if (!method.equals("GET") && !method.equals("HEAD")) return Answer.error(405, "use GET for " + path);
       return new Answer(200, "text/plain", usage(), "help page");
     }
+    if (path.equals("/recognize")) return recognize(ex, method);
     boolean service = path.equals("/vsearch");
     boolean hook = path.startsWith("/test/");
     if (!service && !hook) return Answer.error(404, "no such path " + path + " (the service is POST /vsearch)");
@@ -268,6 +271,46 @@ public final class ReferenceServer implements AutoCloseable {
           "test hook: body that is not JSON");
     }
     return search(ex.getRequestHeaders().getFirst("Content-Type"), body);
+  }
+
+  /**
+   * The search alone, for {@link RemoteRecognizer}: GET lists the indexed products, POST
+   * {@code ?width=W&height=H} with W x H luminance bytes answers the product seen.
+   */
+  private Answer recognize(HttpExchange ex, String method) throws IOException {
+    if (method.equals("GET")) {
+      Map<String, Object> doc = new LinkedHashMap<>();
+      doc.put("products", recognizer.indexedIds());
+      return new Answer(200, "application/json", Json.write(doc), "recognizer: product list");
+    }
+    if (!method.equals("POST")) return Answer.error(405, "use GET or POST for /recognize");
+    int w = 0, h = 0;
+    String query = ex.getRequestURI().getQuery();
+    for (String kv : query == null ? new String[0] : query.split("&")) {
+      try {
+        if (kv.startsWith("width=")) w = Integer.parseInt(kv.substring(6));
+        if (kv.startsWith("height=")) h = Integer.parseInt(kv.substring(7));
+      } catch (NumberFormatException e) {
+        return Answer.error(400, "bad /recognize query " + query);
+      }
+    }
+    byte[] body = readBody(ex);
+    if (body == null) return Answer.error(413, "request body over " + options.maxBodyBytes + " bytes");
+    if (w <= 0 || h <= 0 || (long) w * h != body.length) {
+      return Answer.error(400, "expected ?width=W&height=H and W x H luminance bytes, got " + body.length + " bytes for " + query);
+    }
+    Recognizer.Match m = recognizer.find(body, w, h);
+    Map<String, Object> doc = new LinkedHashMap<>();
+    if (m != null) {
+      List<Object> corners = new ArrayList<>();
+      for (double c : m.corners) corners.add(c);
+      doc.put("product", m.product.id);
+      doc.put("corners", corners);
+      doc.put("inliers", m.inliers);
+      doc.put("matches", m.matches);
+    }
+    return new Answer(200, "application/json", Json.write(doc),
+        String.format(Locale.ROOT, "recognizer: %dx%d: %s", w, h, m == null ? "no product" : m.product.id));
   }
 
   /**
@@ -438,6 +481,9 @@ public final class ReferenceServer implements AutoCloseable {
         "outline in the frame as \"boundingBox\") holding \"SearchTerms\" and \"ExternalResult\";",
         "else an empty result list.",
         "Test hooks (POST): /test/500, /test/notjson, /test/slow/<ms>.",
+        "/recognize does the product search alone for a server in another JVM (one given",
+        "ORZAVS_RECOGNIZER=http://HOST:PORT/recognize): GET lists the products, POST",
+        "?width=W&height=H with a frame's W x H luminance bytes answers the product seen.",
         "");
   }
 

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <numeric>
 #include <thread>
 #include <vector>
 
@@ -32,7 +33,7 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
     EXPECT_EQ("", out.text());
   }
   std::vector<int> expected(21);
-  for (int i = 0; i < 21; ++i) expected[i] = i;
+  std::iota(expected.begin(), expected.end(), 0);
   EXPECT_EQ(expected, log);
   for (auto& job : jobs) {
     EXPECT_EQ(job == jobs[5] ? Tovra::AwaitingReply : Tovra::Finished, job->state());
@@ -51,8 +52,8 @@ TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
     engine.addJob(&job);
     std::this_thread::sleep_for(Ms(20));
   }
-  EXPECT_EQ(Tovra::Queued, job.state());  // destruction discards the queue without settling it
-  EXPECT_EQ(0, job.runs());
+  // Destruction discards the queue without settling it.
+  EXPECT_EQ(std::make_pair(int32_t{Tovra::Queued}, 0), std::make_pair(job.state(), job.runs()));
 }
 
 TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResumed) {

@@ -43,8 +43,8 @@ TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {
   transport.pushServerResponse(makeResponse("dup", "first", 503));
   transport.pushServerResponse(makeResponse("dup", "second"));
   ASSERT_EQ(1u, first.count());
-  EXPECT_EQ("first", first.responses()[0].responseStr);
-  EXPECT_EQ(503, first.responses()[0].responseCode);
+  EXPECT_EQ(std::make_pair(std::string("first"), 503),
+            std::make_pair(first.responses()[0].responseStr, first.responses()[0].responseCode));
   EXPECT_EQ(0u, second.count());
   EXPECT_EQ(0u, transport.pendingCount());
 

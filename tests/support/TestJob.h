@@ -33,7 +33,6 @@ class TestJob : public Tovra::Job {
     if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
   }
 
-  // Polls until the state is `wanted`; false after the timeout.
   bool waitForState(int32_t wanted, Ms timeout = Ms(10000)) {
     return waitFor([&] { return state_.load() == wanted; }, timeout);
   }
@@ -41,10 +40,8 @@ class TestJob : public Tovra::Job {
   int32_t state() const { return state_.load(); }
   int runs() const { return runs_.load(); }
 
-  // Work done inside run(), after the state became Running.
-  std::function<void(TestJob&)> work;
-  // Called inside markQueued(), after the state became Queued.
-  std::function<void(TestJob&)> onMarkQueued;
+  // Run inside run() and markQueued(), after the state became Running or Queued.
+  std::function<void(TestJob&)> work, onMarkQueued;
   // When set, run() ends in AwaitingReply instead of leaving the state to the executor.
   bool endAwaitingReply = false;
 

@@ -222,21 +222,19 @@ static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionI
 
 TEST(ResultsTest, DefaultsAndAMetadataClearThatEqualsAFreshOne) {
   const ObjectInfo info, qr(Tovra::QR_CODE);
-  EXPECT_EQ(6, info.srcObjectModule);
-  EXPECT_EQ(11, info.contentType);
+  EXPECT_EQ(std::make_tuple(6, 11, 6, 2), std::make_tuple(+info.srcObjectModule, +info.contentType,
+                                                           +qr.srcObjectModule, +qr.contentType));
   EXPECT_TRUE(info.content.empty() && info.properties.empty() && info.subContents.empty() && info.location.empty());
-  EXPECT_EQ(2, qr.contentType);
-  EXPECT_EQ(6, qr.srcObjectModule);
   ResultMetadata metadata;
   metadata.isFinalAccumulation = true;
   metadata.queryID = "q";
   metadata.mobileDecorator = "TeskarMobileDecorator";
   metadata.accumulatedQueries.assign(10, "q");
+  auto isEmpty = [](const ResultMetadata& m) {
+    return !m.isFinalAccumulation && m.queryID.empty() && m.mobileDecorator.empty() && m.accumulatedQueries.empty();
+  };
   metadata.clear();
-  EXPECT_FALSE(metadata.isFinalAccumulation);
-  EXPECT_TRUE(metadata.queryID.empty() && metadata.mobileDecorator.empty() && metadata.accumulatedQueries.empty());
-  const ResultMetadata fresh;
-  EXPECT_TRUE(!fresh.isFinalAccumulation && fresh.queryID.empty() && fresh.accumulatedQueries.empty());
+  EXPECT_TRUE(isEmpty(metadata) && isEmpty(ResultMetadata()));
 }
 
 TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {

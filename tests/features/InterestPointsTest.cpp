@@ -255,10 +255,7 @@ TEST(InterestPointsTest, OnlyTheFirstPlaneOfAUsableFrameIsRead) {
   EXPECT_EQ(runGray(gray, w, h, w).size(), 10u);
 
   EXPECT_TRUE(run(ImageBuffer(0, GRAY, w, h, w, 1, nullptr)).empty());
-  for (int bad : {6, 0, -1}) {
-    EXPECT_TRUE(runGray(gray, bad, h, w).empty()) << bad;
-    EXPECT_TRUE(runGray(gray, w, bad, w).empty()) << bad;
-  }
+  for (int bad : {6, 0, -1}) EXPECT_TRUE(runGray(gray, bad, h, w).empty() && runGray(gray, w, bad, w).empty()) << bad;
   EXPECT_TRUE(runGray(gray, w, h, w - 1).empty());  // stride below width
 
   // A buffer that knows its size: a plane reaching past it is not read at all.

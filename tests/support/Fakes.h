@@ -99,9 +99,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     thread_.join();
   }
 
-  void setResponder(Responder responder) {
-    locked([&] { responder_ = std::move(responder); });
-  }
+  void setResponder(Responder responder) { locked([&] { responder_ = std::move(responder); }); }
   // Answers every request with a reply whose query id is the request id.
   void answerEverything(Ms delay = Ms(0)) {
     setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {

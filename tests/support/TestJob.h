@@ -4,6 +4,7 @@
 #include <atomic>
 #include <functional>
 #include <memory>
+#include <utility>
 #include <vector>
 
 #include "exec/Job.h"
@@ -39,6 +40,7 @@ class TestJob : public Tovra::Job {
 
   int32_t state() const { return state_.load(); }
   int runs() const { return runs_.load(); }
+  std::pair<int32_t, int> outcome() const { return {state(), runs()}; }
 
   // Run inside run() and markQueued(), after the state became Running or Queued.
   std::function<void(TestJob&)> work, onMarkQueued;
@@ -51,6 +53,8 @@ class TestJob : public Tovra::Job {
   std::atomic<int32_t> state_{Tovra::Idle};
   std::atomic<int> runs_{0};
 };
+
+inline std::pair<int32_t, int> outcome(int32_t state, int runs) { return {state, runs}; }
 
 // Jobs numbered from..to (inclusive), logging into `log`.
 inline std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, std::vector<int>* log = nullptr) {

@@ -52,10 +52,8 @@ struct CountingEvents : Tovra::EventDelegateBase {
   std::atomic<size_t> frames{0}, tooManyPoints{0};
 };
 
-// Client threads feed frames (copied and lent) while another thread starts, pauses, resumes and
-// stops the engine, and the transport answers from its own thread after random delays, with
-// errors, or never. At most one callback per reply; once things calm down every request gets
-// exactly one; deleting the engine with replies in flight is safe.
+// Clients feed copied and lent frames, a thread drives the lifecycle, the transport answers late,
+// wrongly or never: at most one callback per reply, exactly one once calm; deletion stays safe.
 TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCallbacks) {
   CountingEvents events;
   FakeTransport transport;
@@ -111,9 +109,9 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   threads.emplace_back([&] {
     std::mt19937 random(99);
     while (!stop) {
-      void (Tovra::TovraStateEngine::*const ops[])() = {
-          &Tovra::TovraStateEngine::pauseEngine, &Tovra::TovraStateEngine::resumeEngine, &Tovra::TovraStateEngine::resumeEngine,
-          &Tovra::TovraStateEngine::stopEngine, &Tovra::TovraStateEngine::startEngine, &Tovra::TovraStateEngine::startEngine};
+      using E = Tovra::TovraStateEngine;
+      void (E::*const ops[])() = {&E::pauseEngine, &E::resumeEngine, &E::resumeEngine,
+                                  &E::stopEngine,  &E::startEngine,  &E::startEngine};
       ((*engine).*ops[random() % 6])();
       std::this_thread::sleep_for(Ms(2 + random() % 15));
     }
@@ -123,8 +121,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   for (auto& t : threads) t.join();
   ASSERT_TRUE(waitFor([&] { return transport.idle(); }));
 
-  EXPECT_GT(transport.sentCount(), 0u);
-  EXPECT_GT(events.frames.load(), 0u);
+  EXPECT_TRUE(transport.sentCount() > 0 && events.frames.load() > 0);
   EXPECT_EQ(transport.pushedCount() + transport.droppedCount(), transport.sentCount());
   {
     std::lock_guard<std::mutex> lock(responderMutex);
@@ -136,8 +133,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
     alwaysAnswer = true;
   }
 
-  // Calm: a fresh start and a transport that always answers. Every request now gets exactly
-  // one callback.
+  // Calm: a fresh start and a transport that always answers.
   engine->stopEngine();
   engine->startEngine();
   const size_t sentBefore = transport.sentCount();
@@ -196,10 +192,8 @@ TEST_F(LateReplyTest, DeletionWaitsOutADeliveryButPauseDoesNot) {
   ASSERT_TRUE(waitFor([&] { return transport.idle(); }));
 }
 
-// Two threads take records from the pool and fill them, two others (jobs) read them and drop
-// their reference when done. A record must never be handed out while someone else still holds
-// it, every handed-out id is unique, and each hand-out must be ordered after the previous
-// holder's last use and after the other taker's hand-outs (ThreadSanitizer checks that part).
+// Two takers fill records, two jobs read and drop them: no record is handed out while held, ids
+// are unique, and each hand-out is ordered after the previous holder's last use (TSan checks).
 TEST(FrameRecordManagerStress, RecordsReleasedOnOtherThreadsAreReusedSafely) {
   constexpr int kFramesEach = 2000;
   Tovra::FrameRecordManager pool(5);

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <numeric>
 #include <thread>
 #include <vector>
 
@@ -32,12 +33,9 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
     EXPECT_EQ("", out.text());
   }
   std::vector<int> expected(21);
-  for (int i = 0; i < 21; ++i) expected[i] = i;
+  std::iota(expected.begin(), expected.end(), 0);
   EXPECT_EQ(expected, log);
-  for (auto& job : jobs) {
-    EXPECT_EQ(job == jobs[5] ? Tovra::AwaitingReply : Tovra::Finished, job->state());
-    EXPECT_EQ(1, job->runs());
-  }
+  for (auto& job : jobs) EXPECT_EQ(outcome(job == jobs[5] ? Tovra::AwaitingReply : Tovra::Finished, 1), job->outcome());
   for (int32_t busy : {Tovra::Queued, Tovra::Running, Tovra::AwaitingReply}) EXPECT_TRUE(Tovra::isBusyState(busy));
   for (int32_t idle : {Tovra::Idle, Tovra::Finished}) EXPECT_FALSE(Tovra::isBusyState(idle));
 }
@@ -51,8 +49,7 @@ TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
     engine.addJob(&job);
     std::this_thread::sleep_for(Ms(20));
   }
-  EXPECT_EQ(Tovra::Queued, job.state());  // destruction discards the queue without settling it
-  EXPECT_EQ(0, job.runs());
+  EXPECT_EQ(outcome(Tovra::Queued, 0), job.outcome());  // destruction discards the queue without settling it
 }
 
 TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResumed) {
@@ -91,8 +88,7 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   StdoutCapture out;
   engine.addJob(&racing);
   EXPECT_EQ("Error: Adding job to stopped/canceled execution engine\n", out.text());
-  EXPECT_EQ(Tovra::Finished, racing.state());
-  EXPECT_EQ(0, racing.runs());
+  EXPECT_EQ(outcome(Tovra::Finished, 0), racing.outcome());
 }
 
 TEST(TovraExecutionEngineTest, DestructionSettlesQueuedJobsAndJoins) {
@@ -111,9 +107,7 @@ TEST(TovraExecutionEngineTest, DestructionSettlesQueuedJobsAndJoins) {
   engine.reset();  // returns only once the worker drained the queue and was joined
   EXPECT_TRUE(release.isOpen());
   EXPECT_EQ(Tovra::Finished, running.state());
-  for (auto& job : queued) {
-    EXPECT_EQ(Tovra::Finished, job->state());
-    EXPECT_EQ(0, job->runs());  // taken after stopping was set: settled, not run
-  }
+  // Taken after stopping was set: settled, not run.
+  for (auto& job : queued) EXPECT_EQ(outcome(Tovra::Finished, 0), job->outcome());
   releaser.join();
 }

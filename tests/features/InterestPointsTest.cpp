@@ -94,8 +94,7 @@ TEST(Fast9Test, KernelsAgreeOnLargePlanesAndKeepManyCorners) {
   }
   GuardedPlane noise(fast9ref::makePlane(150, 110, 150, Content::Noise, rng));
   for (int b : {20, 50}) {
-    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best).corners.size(), 512u);
-    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best, true).corners.size(), 512u);
+    EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best, true).corners.size(), 512u);  // raw has more
     expectAgreement(noise.data(), 150, 110, 150, b, true);
   }
 }
@@ -143,12 +142,10 @@ TEST(Fast9Test, UniformPlaneBordersAndEqualNeighbours) {
     SCOPED_TRACE(std::to_string(c.dx) + "," + std::to_string(c.dy) + " second " + std::to_string(c.second));
     const std::vector<uint8_t> p = dotPlane(w, h, {{14, 14, 200}, {14 + c.dx, 14 + c.dy, c.second}});
     expectAgreement(p.data(), w, h, w, 50, true);
-    const Result kept = detect(p.data(), w, h, w, 50, Fast9Path::Best, true);
     const Result expected = c.second == 200 ? Result{}
                             : c.second < 200 ? Result{{{14, 14}}, {199}}
                                              : Result{{{14 + c.dx, 14 + c.dy}}, {c.second - 1}};
-    EXPECT_EQ(kept.corners, expected.corners);
-    EXPECT_EQ(kept.scores, expected.scores);
+    assertSame(detect(p.data(), w, h, w, 50, Fast9Path::Best, true), expected);
   }
 }
 
@@ -255,10 +252,7 @@ TEST(InterestPointsTest, OnlyTheFirstPlaneOfAUsableFrameIsRead) {
   EXPECT_EQ(runGray(gray, w, h, w).size(), 10u);
 
   EXPECT_TRUE(run(ImageBuffer(0, GRAY, w, h, w, 1, nullptr)).empty());
-  for (int bad : {6, 0, -1}) {
-    EXPECT_TRUE(runGray(gray, bad, h, w).empty()) << bad;
-    EXPECT_TRUE(runGray(gray, w, bad, w).empty()) << bad;
-  }
+  for (int bad : {6, 0, -1}) EXPECT_TRUE(runGray(gray, bad, h, w).empty() && runGray(gray, w, bad, w).empty()) << bad;
   EXPECT_TRUE(runGray(gray, w, h, w - 1).empty());  // stride below width
 
   // A buffer that knows its size: a plane reaching past it is not read at all.

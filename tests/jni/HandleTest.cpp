@@ -1,9 +1,7 @@
 // Handles: native addresses crossing JNI as jlong. 32-bit Android keeps much of its heap above
-// 2 GiB, where a plain (sign-extending) cast would give Java a negative handle naming nothing.
-// While a test holds a HighHeapScope, this binary's operator new serves its thread from an arena
-// mapped at a hinted address above 2 GiB, so the exported functions create, read, change, return
-// and destroy objects there. A 32-bit target requires the arena up there (the test skips, saying
-// so, if the system will not map it); a 64-bit host checks the same round trips wherever it lies.
+// 2 GiB, where a sign-extending cast would give Java a negative handle naming nothing. Inside a
+// HighHeapScope this binary's operator new serves the thread from an arena mapped above 2 GiB
+// (32-bit targets skip if the system will not map one; 64-bit hosts use it wherever it lies).
 
 #include <jni.h>
 #include <sys/mman.h>
@@ -62,8 +60,7 @@ uint8_t* arena() {
   return gArena;
 }
 
-// While alive, this thread's allocations come from the arena (which never frees: it is small
-// and the tests allocate little).
+// While alive, this thread's allocations come from the arena (which never frees).
 struct HighHeapScope {
   HighHeapScope() { tUseArena = true; }
   ~HighHeapScope() { tUseArena = false; }
@@ -71,8 +68,8 @@ struct HighHeapScope {
 
 uint64_t bits(jlong handle) { return static_cast<uint64_t>(handle); }
 
-// A handle names an arena object: on 32 bits it is the zero-extended address, top bit set.
-// (Fatal on failure: the exported functions must not be handed a handle that names nothing.)
+// A handle names an arena object: on 32 bits the zero-extended address, top bit set (fatal:
+// exported functions must not be handed a handle that names nothing).
 void assertHighHandle(jlong handle) {
   if (k32Bit) {
     ASSERT_GT(handle, 0) << std::hex << bits(handle);
@@ -108,8 +105,7 @@ TEST(Handle, ObjectsAboveTwoGigabytesRoundTripThroughExportedFunctions) {
   ORZAVS_TEST_JNI(Point2f_1x_1set)(nullptr, nullptr, point, nullptr, 7.0f);
   EXPECT_EQ(ORZAVS_TEST_JNI(Point2f_1x_1get)(nullptr, nullptr, point, nullptr), 7.0f);
   if (k32Bit) {
-    // The same address sign-extended, as a plain cast would give it, names nothing: the setter
-    // ignores it like a null handle and the object keeps its value.
+    // The address sign-extended, as a plain cast gives it, names nothing: the setter ignores it.
     const jlong signExtended = static_cast<jlong>(static_cast<int32_t>(static_cast<uint32_t>(bits(point))));
     ASSERT_LT(signExtended, 0);
     ORZAVS_TEST_JNI(Point2f_1x_1set)(nullptr, nullptr, signExtended, nullptr, 99.0f);

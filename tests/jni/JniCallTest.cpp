@@ -53,6 +53,7 @@ struct FakeVm {
     env.functions = &table;
   }
   ~FakeVm() { current() = nullptr; }
+  std::string thrown() const { return thrownClass + ": " + thrownMessage; }
   static FakeVm*& current() {
     static FakeVm* vm = nullptr;
     return vm;
@@ -75,15 +76,13 @@ TEST(ExceptionTable, ThrowingClearsFirstThenThrowsTheClassWithTheMessage) {
   Swig::throwJavaException(&vm.env, Swig::JavaIndexOutOfBoundsException, "key not found");
   EXPECT_EQ(vm.calls, (std::vector<std::string>{"ExceptionClear", "FindClass java/lang/IndexOutOfBoundsException",
                                                 "ThrowNew"}));
-  EXPECT_EQ(vm.thrownClass, "java/lang/IndexOutOfBoundsException");
-  EXPECT_EQ(vm.thrownMessage, "key not found");
+  EXPECT_EQ(vm.thrown(), "java/lang/IndexOutOfBoundsException: key not found");
   // Bytes that are not modified UTF-8 never reach ThrowNew.
   Swig::throwJavaException(&vm.env, Swig::JavaRuntimeException, "bad \xFF");
   EXPECT_EQ(vm.thrownMessage, "bad \xEF\xBF\xBD");
   // A director exception whose class cannot be found comes back as a RuntimeException.
   Swig::DirectorException("com/example/Gone", "message").raiseJavaException(&vm.env);
-  EXPECT_EQ(vm.thrownClass, "java/lang/RuntimeException");
-  EXPECT_EQ(vm.thrownMessage, "message");
+  EXPECT_EQ(vm.thrown(), "java/lang/RuntimeException: message");
   Swig::DirectorException exception("java/lang/IllegalStateException", "kept");
   EXPECT_STREQ(exception.what(), "kept");
   EXPECT_STREQ(exception.classname(), "java/lang/IllegalStateException");
@@ -106,8 +105,7 @@ TEST(GuardedCall, MapsNativeExceptionsToJavaOnesAndReturnsZero) {
     vm.thrownClass.clear();
     EXPECT_EQ(orzavs::jni::guarded(&vm.env, [&] { return c.raise(), 17L; }), 0L);
     EXPECT_TRUE(vm.pending);
-    EXPECT_EQ(vm.thrownClass, c.javaClass);
-    EXPECT_EQ(vm.thrownMessage, c.message);
+    EXPECT_EQ(vm.thrown(), std::string(c.javaClass) + ": " + c.message);
   }
   vm.pending = false;
   EXPECT_EQ(orzavs::jni::guarded(&vm.env, [] { return 17; }), 17);

@@ -20,9 +20,8 @@ TEST(ServerRecordsTest, DefaultsConstructionAndClear) {
   uint8_t body[3] = {1, 2, 3};
   const ServerRequest::ParamMap params = {{"a", "b"}};
   ServerRequest request(OrzaVSMobile::ByteArray(body, 3), "id-1", params, params);
-  EXPECT_EQ("id-1", request.id);
-  EXPECT_EQ(params, request.metadata);
-  EXPECT_EQ(body, request.data.getData());  // the bytes are shared, not copied
+  // The bytes are shared, not copied.
+  EXPECT_TRUE(request.id == "id-1" && request.metadata == params && request.data.getData() == body);
   RecordingHandler handler;
   request.responseHandler = &handler;
   request.clear();
@@ -43,10 +42,9 @@ TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {
   transport.pushServerResponse(makeResponse("dup", "first", 503));
   transport.pushServerResponse(makeResponse("dup", "second"));
   ASSERT_EQ(1u, first.count());
-  EXPECT_EQ("first", first.responses()[0].responseStr);
-  EXPECT_EQ(503, first.responses()[0].responseCode);
-  EXPECT_EQ(0u, second.count());
-  EXPECT_EQ(0u, transport.pendingCount());
+  EXPECT_EQ(std::make_pair(std::string("first"), 503),
+            std::make_pair(first.responses()[0].responseStr, first.responses()[0].responseCode));
+  EXPECT_EQ(std::make_pair(size_t{0}, size_t{0}), std::make_pair(second.count(), transport.pendingCount()));
 
   // Once answered, the id is free again; a null handler is registered and its reply consumed.
   transport.sendServerRequest(makeRequest("dup", nullptr));
@@ -77,8 +75,7 @@ TEST(ServerDelegateTest, ForgetDropsOnlyThatHandlerAndWorksFromItsOwnCallback) {
   transport.sendServerRequest(makeRequest("b", &kept));
   transport.forgetHandler(&gone);
   for (const char* id : {"a", "b"}) transport.pushServerResponse(makeResponse(id));
-  EXPECT_EQ(0u, gone.count());
-  EXPECT_EQ(1u, kept.count());
+  EXPECT_EQ(std::make_pair(size_t{0}, size_t{1}), std::make_pair(gone.count(), kept.count()));
 
   RecordingHandler handler;
   handler.onResponse = [&](const ServerResponse& response) {

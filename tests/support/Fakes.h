@@ -1,9 +1,8 @@
 #ifndef ORZAVS_TESTS_SUPPORT_FAKES_H
 #define ORZAVS_TESTS_SUPPORT_FAKES_H
 
-// Test doubles for driving the engine as a client would: an event delegate that records its
-// callbacks, a transport that records requests and answers from its own thread, a response
-// handler that records what it gets, frames, and an engine wired to all of them.
+// Test doubles for driving the engine as a client would: recording delegates and handlers, a
+// transport answering from its own thread, frames, and an engine wired to them.
 
 #include <chrono>
 #include <condition_variable>
@@ -99,9 +98,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
     thread_.join();
   }
 
-  void setResponder(Responder responder) {
-    locked([&] { responder_ = std::move(responder); });
-  }
+  void setResponder(Responder responder) { locked([&] { responder_ = std::move(responder); }); }
   // Answers every request with a reply whose query id is the request id.
   void answerEverything(Ms delay = Ms(0)) {
     setResponder([delay](const SentRequest& sent, Tovra::Server::ServerResponse& reply, Ms& d) {
@@ -185,9 +182,8 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
 };
 
 
-// A frame whose first plane has isolated bright dots on dark (many corners, sharpness > 0) or,
-// with `flat`, is uniform (no corners, sharpness 0). YUV frames get stride * height * 3 / 2
-// bytes, others stride * height.
+// A frame whose first plane has bright dots on dark (many corners, sharpness > 0) or, `flat`, is
+// uniform (no corners, sharpness 0); YUV frames get stride * height * 3 / 2 bytes.
 inline std::vector<uint8_t> makeFrame(int width, int height, int stride, int format, bool flat = false,
                                       uint32_t seed = 1) {
   const size_t plane = static_cast<size_t>(stride) * height;

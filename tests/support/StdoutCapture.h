@@ -7,10 +7,8 @@
 
 namespace orzavs_test {
 
-// Records every line the library prints (its diagnostic sink, from any thread), each followed by
-// a newline: the text the default sink would have written to standard output. Installed from
-// construction until text() or the destructor, which put the default sink back; only one may be
-// active at a time. Lines are delivered one at a time, and none after the sink was put back.
+// Records every line the library prints (its diagnostic sink, any thread) plus a newline, as the
+// default sink would write it, from construction until text() or destruction; one at a time.
 class StdoutCapture {
  public:
   StdoutCapture() {

@@ -4,6 +4,7 @@
 #include <atomic>
 #include <functional>
 #include <memory>
+#include <utility>
 #include <vector>
 
 #include "exec/Job.h"
@@ -33,18 +34,16 @@ class TestJob : public Tovra::Job {
     if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
   }
 
-  // Polls until the state is `wanted`; false after the timeout.
   bool waitForState(int32_t wanted, Ms timeout = Ms(10000)) {
     return waitFor([&] { return state_.load() == wanted; }, timeout);
   }
 
   int32_t state() const { return state_.load(); }
   int runs() const { return runs_.load(); }
+  std::pair<int32_t, int> outcome() const { return {state(), runs()}; }
 
-  // Work done inside run(), after the state became Running.
-  std::function<void(TestJob&)> work;
-  // Called inside markQueued(), after the state became Queued.
-  std::function<void(TestJob&)> onMarkQueued;
+  // Run inside run() and markQueued(), after the state became Running or Queued.
+  std::function<void(TestJob&)> work, onMarkQueued;
   // When set, run() ends in AwaitingReply instead of leaving the state to the executor.
   bool endAwaitingReply = false;
 
@@ -54,6 +53,8 @@ class TestJob : public Tovra::Job {
   std::atomic<int32_t> state_{Tovra::Idle};
   std::atomic<int> runs_{0};
 };
+
+inline std::pair<int32_t, int> outcome(int32_t state, int runs) { return {state, runs}; }
 
 // Jobs numbered from..to (inclusive), logging into `log`.
 inline std::vector<std::unique_ptr<TestJob>> makeJobs(int from, int to, std::vector<int>* log = nullptr) {

@@ -31,10 +31,8 @@ class Gate {
   std::atomic<bool> open_{false};
 };
 
-// Computes `compute(kind, 0)` for every kind on this thread, then `compute(kind, round)` from
-// four threads at once, 30 rounds each with the kind rotating (so what each thread works on
-// keeps changing under it). Returns how many threaded results differ from the single-threaded
-// ones: code without shared state gives 0.
+// Computes `compute(kind, 0)` for every kind here, then `compute(kind, round)` on four threads, 30
+// rounds each with the kind rotating; returns how many threaded results differ (0 without shared state).
 template <typename Compute>
 int threadedMismatches(int kinds, Compute compute) {
   std::vector<decltype(compute(0, 0))> expected;

@@ -46,8 +46,7 @@ void expectEveryFillCopiesNothing(ImageBuffer& buffer, int32_t n) {
 
 TEST(ImageBufferTest, DefaultAndBorrowingBuffersCannotBeFilled) {
   ImageBuffer buffer;
-  EXPECT_EQ(1, static_cast<int32_t>(buffer.format));
-  EXPECT_TRUE(buffer.data == nullptr && buffer.allocLen == 0);
+  EXPECT_TRUE(buffer.format == 1 && buffer.data == nullptr && buffer.allocLen == 0);
   expectEveryFillCopiesNothing(buffer, 16);
   buffer.allocLen = 16;  // a forged allocLen on a null buffer cannot make a fill write
   expectEveryFillCopiesNothing(buffer, 16);
@@ -93,16 +92,13 @@ TEST(ImageBufferTest, FailedReleasedAndEmptyBlocksForbidEveryFill) {
   ASSERT_EQ(64, buffer.allocateBuffer(64));
   uint8_t* block = buffer.data;
   buffer.releaseBuffer();
-  EXPECT_EQ(block, buffer.data);  // the stale pointer stays
-  EXPECT_EQ(0, buffer.allocLen);
+  EXPECT_TRUE(buffer.data == block && buffer.allocLen == 0);  // the stale pointer stays
   buffer.releaseBuffer();  // nothing is freed twice
   buffer.allocLen = 64;    // without the guard the fill would be a use after free
   expectEveryFillCopiesNothing(buffer, 64);
-  EXPECT_EQ(0, buffer.allocateBuffer(-1));
-  EXPECT_EQ(0, buffer.allocLen);
+  EXPECT_TRUE(buffer.allocateBuffer(-1) == 0 && buffer.allocLen == 0);
   expectEveryFillCopiesNothing(buffer, 8);
-  EXPECT_EQ(0, buffer.allocateBuffer(0));
-  EXPECT_NE(nullptr, buffer.data);
+  EXPECT_TRUE(buffer.allocateBuffer(0) == 0 && buffer.data != nullptr);
   expectEveryFillCopiesNothing(buffer, 8);
 }
 
@@ -154,10 +150,8 @@ TEST(ImageBufferTest, CopiesOfOwnBlocksAreDeepAndOtherCopiesKeepTheirBounds) {
   ImageBuffer copy(original), assigned;
   ASSERT_EQ(8, assigned.allocateBuffer(8));  // replaced (and freed) by the assignment
   assigned = original;
-  for (ImageBuffer* duplicate : {&copy, &assigned}) {
-    EXPECT_NE(original.data, duplicate->data);
-    EXPECT_EQ(3, duplicate->definition);
-    EXPECT_EQ(src, contents(*duplicate, 24));
+  for (ImageBuffer* d : {&copy, &assigned}) {
+    EXPECT_TRUE(d->data != original.data && d->definition == 3 && contents(*d, 24) == src);
   }
   original.releaseBuffer();  // the copies outlive the original's block
   ASSERT_EQ(24, assigned.fillBuffer(ones.data(), 24));
@@ -200,8 +194,7 @@ TEST(FrameDataTest, YuvFormatsByteArraysAndDefaults) {
     OrzaVSMobile::ByteArray copy(array);  // shares the bytes
     copy.getData()[0] = 9;
     copy.clear();
-    EXPECT_EQ(nullptr, copy.getData());
-    EXPECT_EQ(5, array.getLength());
+    EXPECT_TRUE(copy.getData() == nullptr && array.getLength() == 5);
   }  // stack memory: freeing it would be reported by ASan
   EXPECT_EQ(9, bytes[0]);
   const OrzaVSMobile::ExtraFrameData extra;  // -1 means unknown
@@ -222,21 +215,19 @@ static_assert(allInt32<Tovra::ObjectModuleID, Tovra::ContentType, Tovra::ActionI
 
 TEST(ResultsTest, DefaultsAndAMetadataClearThatEqualsAFreshOne) {
   const ObjectInfo info, qr(Tovra::QR_CODE);
-  EXPECT_EQ(6, info.srcObjectModule);
-  EXPECT_EQ(11, info.contentType);
+  EXPECT_EQ(std::make_tuple(6, 11, 6, 2), std::make_tuple(+info.srcObjectModule, +info.contentType,
+                                                           +qr.srcObjectModule, +qr.contentType));
   EXPECT_TRUE(info.content.empty() && info.properties.empty() && info.subContents.empty() && info.location.empty());
-  EXPECT_EQ(2, qr.contentType);
-  EXPECT_EQ(6, qr.srcObjectModule);
   ResultMetadata metadata;
   metadata.isFinalAccumulation = true;
   metadata.queryID = "q";
   metadata.mobileDecorator = "TeskarMobileDecorator";
   metadata.accumulatedQueries.assign(10, "q");
+  auto isEmpty = [](const ResultMetadata& m) {
+    return !m.isFinalAccumulation && m.queryID.empty() && m.mobileDecorator.empty() && m.accumulatedQueries.empty();
+  };
   metadata.clear();
-  EXPECT_FALSE(metadata.isFinalAccumulation);
-  EXPECT_TRUE(metadata.queryID.empty() && metadata.mobileDecorator.empty() && metadata.accumulatedQueries.empty());
-  const ResultMetadata fresh;
-  EXPECT_TRUE(!fresh.isFinalAccumulation && fresh.queryID.empty() && fresh.accumulatedQueries.empty());
+  EXPECT_TRUE(isEmpty(metadata) && isEmpty(ResultMetadata()));
 }
 
 TEST(EnumNamesTest, TablesHoldExactlyTheNamedEnumerators) {

@@ -36,9 +36,7 @@ inline uint8_t clampByte(double v) {
 // Gentle gradients and waves (what baseline JPEG reproduces well), or independent noise in every
 // sample (which compresses badly, so streams are long).
 inline Yuv420 makeYuv(int width, int height, bool noise = false) {
-  Yuv420 img;
-  img.width = width;
-  img.height = height;
+  Yuv420 img{width, height, {}, {}, {}};
   img.y.resize(static_cast<size_t>(width) * height);
   img.u.resize(static_cast<size_t>(img.cw()) * img.ch());
   img.v.resize(img.u.size());

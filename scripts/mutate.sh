@@ -321,7 +321,9 @@ for i in "${!ids[@]}"; do
   if [ ! -f "$file" ]; then
     printf '%-26s stale (no file %s)\n' "$id" "${files[$i]}"; stale=$((stale + 1)); continue
   fi
-  text="$(read_file "$file")"
+  # Read with a sentinel: a bare command substitution would drop the final newline, and the
+  # restored file would then differ from the tree's and be rebuilt on every later run.
+  text="$(cat "$file"; printf x)"; text="${text%x}"
   n="$(occurrences "$text" "${origs[$i]}")"
   if [ "$n" != 1 ]; then
     [ "$n" = 0 ] && why="snippet not found" || why="snippet occurs more than once"

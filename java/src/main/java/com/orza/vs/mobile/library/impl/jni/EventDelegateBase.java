@@ -25,7 +25,7 @@ package com.orza.vs.mobile.library.impl.jni;
  * reachable for as long as the engine may call it (the {@link TovraStateEngineFacade} proxy
  * keeps the one it was built with).
  */
-public class EventDelegateBase implements AutoCloseable {
+public class EventDelegateBase implements NativeProxy {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
 
@@ -52,12 +52,6 @@ public class EventDelegateBase implements AutoCloseable {
       }
       swigCPtr = 0;
     }
-  }
-
-  /** Same as {@link #delete()}, for try-with-resources. */
-  @Override
-  public void close() {
-    delete();
   }
 
   /** Called by the native delegate while it is destroyed: forget the handle. */

@@ -23,7 +23,7 @@ import java.util.RandomAccess;
  *
  * @param <E> the element type
  */
-public abstract class NativeList<E> extends AbstractList<E> implements RandomAccess, AutoCloseable {
+public abstract class NativeList<E> extends AbstractList<E> implements RandomAccess, NativeProxy {
   private static final String OUT_OF_RANGE = "vector index out of range";
 
   final NativeRef nref;
@@ -185,15 +185,8 @@ public abstract class NativeList<E> extends AbstractList<E> implements RandomAcc
     delete();
   }
 
-  /** Frees the native vector if this proxy owns it; afterwards any use throws IllegalStateException. */
-  public void delete() {
-    long cPtr = nref.endDeleted();
-    if (cPtr != 0) deleteNative(cPtr);
-  }
-
-  /** Same as {@link #delete()}, for try-with-resources. */
   @Override
-  public void close() {
-    delete();
+  public void delete() {
+    nref.delete(this::deleteNative);
   }
 }

@@ -21,7 +21,7 @@ import java.util.Set;
  *
  * @param <V> the value type
  */
-public abstract class NativeMap<V> extends AbstractMap<String, V> implements AutoCloseable {
+public abstract class NativeMap<V> extends AbstractMap<String, V> implements NativeProxy {
   final NativeRef nref;
 
   NativeMap(long cPtr, boolean cMemoryOwn) {
@@ -185,15 +185,8 @@ public abstract class NativeMap<V> extends AbstractMap<String, V> implements Aut
     delete();
   }
 
-  /** Frees the native map if this proxy owns it; afterwards any use throws IllegalStateException. */
-  public void delete() {
-    long cPtr = nref.endDeleted();
-    if (cPtr != 0) deleteNative(cPtr);
-  }
-
-  /** Same as {@link #delete()}, for try-with-resources. */
   @Override
-  public void close() {
-    delete();
+  public void delete() {
+    nref.delete(this::deleteNative);
   }
 }

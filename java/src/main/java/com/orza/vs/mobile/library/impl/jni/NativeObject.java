@@ -7,7 +7,7 @@ package com.orza.vs.mobile.library.impl.jni;
  * object, an element of a vector, a callback's argument) never frees and becomes unusable with
  * what it borrows from.
  */
-public abstract class NativeObject implements AutoCloseable {
+public abstract class NativeObject implements NativeProxy {
   final NativeRef nref;
 
   NativeObject(long cPtr, boolean cMemoryOwn) {
@@ -37,15 +37,8 @@ public abstract class NativeObject implements AutoCloseable {
     delete();
   }
 
-  /** Frees the native object if this proxy owns it; afterwards any use throws IllegalStateException. */
-  public void delete() {
-    long cPtr = nref.endDeleted();
-    if (cPtr != 0) deleteNative(cPtr);
-  }
-
-  /** Same as {@link #delete()}, for try-with-resources. */
   @Override
-  public void close() {
-    delete();
+  public void delete() {
+    nref.delete(this::deleteNative);
   }
 }

@@ -104,12 +104,18 @@ final class NativeRef {
    * the address that the caller must now free, or 0 when the proxy does not own it or it had
    * ended already.
    */
-  synchronized long endDeleted() {
+  private synchronized long endDeleted() {
     if (ended != null) return 0;
     ended = DELETED;
     boolean free = owned;
     owned = false;
     return free ? cPtr : 0;
+  }
+
+  /** Ends the object as deleted and, if it was owned, frees it through {@code deleteNative}; once only. */
+  void delete(java.util.function.LongConsumer deleteNative) {
+    long cPtr = endDeleted();
+    if (cPtr != 0) deleteNative.accept(cPtr);
   }
 
   /** The end of a callback: the argument it lent (never owned) is gone. */

@@ -1,7 +1,7 @@
 package com.orza.vs.mobile.library.impl.jni;
 
 /** The engine's view of a transport: something it can send a request to. */
-public class ServerDelegateInterface implements AutoCloseable {
+public class ServerDelegateInterface implements NativeProxy {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
 
@@ -27,12 +27,6 @@ public class ServerDelegateInterface implements AutoCloseable {
       }
       swigCPtr = 0;
     }
-  }
-
-  /** Same as {@link #delete()}, for try-with-resources. */
-  @Override
-  public void close() {
-    delete();
   }
 
   public boolean sendServerRequest(ServerRequest request) {

@@ -23,7 +23,7 @@ package com.orza.vs.mobile.library.impl.jni;
  * running before this proxy's can free a delegate the engine still calls. {@link #delete} hands
  * them back (and frees those the application deleted meanwhile). Delete the engine first.
  */
-public class TovraStateEngineFacade implements AutoCloseable {
+public class TovraStateEngineFacade implements NativeProxy {
   private transient long swigCPtr;
   protected transient boolean swigCMemOwn;
   // A delegate the native engine calls, held (and its native object owned) while it lives.

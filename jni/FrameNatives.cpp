@@ -162,28 +162,6 @@ jint wrapPlanes(JNIEnv* env, jclass, jlong imageHandle, jobject y, jint yRowStri
   }
 }
 
-// Lends a packed NV21 frame (row stride = width) to the image.
-void wrapNv21(JNIEnv* env, jclass, jlong imageHandle, jobject frame, jint width, jint height) {
-  try {
-    ImageBuffer& image = imageOf(env, imageHandle);
-    requireGeometry(env, width, height);
-    const Plane plane = planeOf(env, "NV21", frame, width, 1);
-    const int64_t needed = int64_t{width} * height * 3 / 2;
-    if (plane.capacity < needed) {
-      badArgument(env, "NV21 frame holds " + std::to_string(plane.capacity) + " bytes, " +
-                           std::to_string(width) + "x" + std::to_string(height) + " needs " +
-                           std::to_string(needed));
-    }
-    image.format = ImageFormat::NV21;
-    image.width = width;
-    image.height = height;
-    image.widthStep = width;
-    image.data = const_cast<uint8_t*>(plane.data);
-    image.allocLen = 0;
-  } catch (const Thrown&) {
-  }
-}
-
 // Writes the planes as NV21 into the image's memory (lent by the engine, described beforehand
 // with the same width and height), in one pass over the source.
 void copyPlanes(JNIEnv* env, jclass, jlong imageHandle, jobject y, jint yRowStride, jobject u,
@@ -262,8 +240,6 @@ void registerFrameNatives(JNIEnv* env) noexcept {
       {const_cast<char*>("copyPlanes"),
        const_cast<char*>("(JLjava/nio/ByteBuffer;ILjava/nio/ByteBuffer;Ljava/nio/ByteBuffer;IIII)V"),
        reinterpret_cast<void*>(&copyPlanes)},
-      {const_cast<char*>("wrapNv21"), const_cast<char*>("(JLjava/nio/ByteBuffer;II)V"),
-       reinterpret_cast<void*>(&wrapNv21)},
       {const_cast<char*>("points"), const_cast<char*>("(J)[F"), reinterpret_cast<void*>(&pointsOf)},
   };
   // A failure leaves NoSuchMethodError pending; the class's first native call reports it.

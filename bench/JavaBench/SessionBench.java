@@ -191,7 +191,7 @@ public final class SessionBench {
     makeFrames();
     String[] names = {
       "low-level loop, NV21 byte[]", "session, NV21 byte[]",
-      "low-level loop, direct NV21", "session, direct NV21 (in place)",
+      "low-level loop, direct NV21", "session, direct NV21",
       "Java packs planar -> session", "session, planar planes (1 pass)",
       "Java packs NV21 block -> session", "session, NV21 block (in place)",
     };

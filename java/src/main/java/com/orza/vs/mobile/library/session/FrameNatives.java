@@ -38,9 +38,6 @@ final class FrameNatives {
   static native void copyPlanes(long image, ByteBuffer y, int yRowStride, ByteBuffer u, ByteBuffer v,
                                 int uvRowStride, int uvPixelStride, int width, int height);
 
-  /** Points {@code image} at a packed NV21 frame in a direct buffer (row stride = width). */
-  static native void wrapNv21(long image, ByteBuffer frame, int width, int height);
-
   /** The points of a native point vector as x0, y0, x1, y1, ... (a new array). */
   static native float[] points(long vector);
 }

@@ -60,9 +60,9 @@ import java.util.List;
  * they already form NV21 or NV12 in one block (chroma pixel stride 2, which most devices
  * deliver), the engine reads them where they lie: no copy is made. Otherwise they are written
  * once, in one pass, into memory the engine lends for the frame. {@link #processNv21(byte[], int,
- * int, long)} takes an NV21 array (the old camera API's preview callback), copied once into the
- * lent memory; a direct NV21 {@link ByteBuffer} is read where it lies. Width and height must be
- * even. The frame's memory must stay unchanged until the call returns, and not longer.
+ * int, long)} takes an NV21 array (the old camera API's preview callback) or buffer, copied once
+ * into the lent memory: while a query is out the engine keeps a copy of nearly every frame, and a
+ * frame already in its memory needs none. Width and height must be even. The frame's memory must stay unchanged until the call returns, and not longer.
  *
  * <p>Each process call returns whether the engine took the frame: false while the session is
  * not running (before {@link #start()}, while paused, after {@link #close()}) or when every
@@ -172,35 +172,43 @@ public final class VisualSearchSession implements AutoCloseable {
   /** An NV21 frame in an array of at least width x height x 3/2 bytes. */
   public boolean processNv21(byte[] nv21, int width, int height, long timestampNanos) {
     if (nv21 == null) throw new NullPointerException("NV21 frame is null");
-    checkSize(width, height);
-    long needed = (long) width * height * 3 / 2;
-    if (nv21.length < needed) {
-      throw new IllegalArgumentException("NV21 frame holds " + nv21.length + " bytes, " + width + "x"
-          + height + " needs " + needed);
-    }
+    int needed = nv21Bytes(nv21.length, width, height);
     synchronized (frameLock) {
       if (!lendFrame(width, height, timestampNanos)) return false;
-      image.fillBuffer(nv21, (int) needed);
+      image.fillBuffer(nv21, needed);
       return run(true);
     }
   }
 
   /**
-   * An NV21 frame in a buffer of at least width x height x 3/2 bytes from its start: a direct
-   * buffer is read in place, a heap buffer's array is copied.
+   * An NV21 frame in a direct buffer, or a heap buffer with an accessible array, of at least
+   * width x height x 3/2 bytes from its start; copied once into lent memory, like an array.
    */
   public boolean processNv21(ByteBuffer nv21, int width, int height, long timestampNanos) {
     if (nv21 != null && !nv21.isDirect() && nv21.hasArray() && nv21.arrayOffset() == 0) {
       return processNv21(nv21.array(), width, height, timestampNanos);
     }
-    synchronized (frameLock) {
-      if (state != State.RUNNING) return false;
-      FrameNatives.wrapNv21(imageHandle, nv21, width, height);
-      remember(ImageFormat.NV21.swigValue(), width, height, width);
-      pinnedY = nv21;
-      extra.setTimeStamp(timestampNanos / 1e9);
-      return run(false);
+    if (nv21 == null) throw new NullPointerException("NV21 frame is null");
+    if (!nv21.isDirect()) {
+      throw new IllegalArgumentException("NV21 frame is neither a direct ByteBuffer nor array-backed");
     }
+    int needed = nv21Bytes(nv21.capacity(), width, height);
+    synchronized (frameLock) {
+      if (!lendFrame(width, height, timestampNanos)) return false;
+      image.fillBufferWithByteBuffer(nv21, needed);
+      return run(true);
+    }
+  }
+
+  // The bytes of a width x height NV21 frame, checked against the `length` the caller holds.
+  private static int nv21Bytes(int length, int width, int height) {
+    checkSize(width, height);
+    int needed = width * height / 2 * 3;
+    if (length < needed) {
+      throw new IllegalArgumentException("NV21 frame holds " + length + " bytes, " + width + "x" + height
+          + " needs " + needed);
+    }
+    return needed;
   }
 
   /**

@@ -1,24 +1,18 @@
 package com.orza.vs.mobile.library.impl.jni;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertNull;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import java.nio.ByteBuffer;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
 
 class RecordFamiliesTest {
-  static void assertThrowsWithMessage(Class<? extends Throwable> type, String message,
-                                      Executable call) {
-    Throwable thrown = assertThrows(type, call);
-    assertEquals(message, thrown.getMessage());
+  static void assertThrowsWithMessage(Class<? extends Throwable> type, String message, Executable call) {
+    assertEquals(message, assertThrows(type, call).getMessage());
   }
 
-  static void assertNullReference(String message, Executable call) {
+  /** The call raises NullPointerException with exactly {@code message}. */
+  static void assertNpe(String message, Executable call) {
     assertThrowsWithMessage(NullPointerException.class, message, call);
   }
 
@@ -29,10 +23,10 @@ class RecordFamiliesTest {
     pair.setFirst("changed");
     assertEquals("a", copy.getFirst());
     assertEquals("", new StringPair().getSecond());
-    assertNullReference("std::pair< std::string,std::string > const & reference is null",
+    assertNpe("std::pair< std::string,std::string > const & reference is null",
         () -> new StringPair((StringPair) null));
-    assertNullReference("null string", () -> new StringPair(null, "x"));
-    assertNullReference("null string", () -> pair.setSecond(null));
+    assertNpe("null string", () -> new StringPair(null, "x"));
+    assertNpe("null string", () -> pair.setSecond(null));
     assertEquals("b", pair.getSecond());
     FrameID id = new FrameID();
     String text = "caf\u00e9 \u20ac \ud83d\ude00 a\u0000b";
@@ -56,26 +50,24 @@ class RecordFamiliesTest {
     focus.setX(99);
     assertEquals(1, extra.getFocusROI().getX());
     assertEquals(4, extra.getFocusROI().getHeight());
-    assertNullReference("OrzaVSMobile::FrameROI const & reference is null", () -> extra.setFocusROI(null));
+    assertNpe("OrzaVSMobile::FrameROI const & reference is null", () -> extra.setFocusROI(null));
     extra.setScreenOrient(270);
     extra.setFieldOfView(62.5);
     assertEquals(270, extra.getScreenOrient());
     assertEquals(62.5, extra.getFieldOfView());
     // A field view dies with its parent.
-    try (ExtraFrameData closing = extra) {
-      closing.setFlat(true);
-    }
-    Throwable late = assertThrows(IllegalStateException.class, display::getWidth);
-    assertEquals("FrameROI is part of another object that is no longer usable: "
-        + "ExtraFrameData has been deleted", late.getMessage());
+    extra.close();
+    assertThrowsWithMessage(IllegalStateException.class,
+        "FrameROI is part of another object that is no longer usable: ExtraFrameData has been deleted",
+        display::getWidth);
   }
 
   @Test
   void nullAndDeletedObjects() {
     OrzaVSMobileJNI.FrameROI_x_set(0, null, 5);  // a setter on null does nothing
     OrzaVSMobileJNI.FrameID_id_set(0, null, "ignored");
-    assertNullReference("OrzaVSMobile::FrameROI object is null", () -> OrzaVSMobileJNI.FrameROI_x_get(0, null));
-    assertNullReference("OrzaVSMobile::ImageBuffer object is null",
+    assertNpe("OrzaVSMobile::FrameROI object is null", () -> OrzaVSMobileJNI.FrameROI_x_get(0, null));
+    assertNpe("OrzaVSMobile::ImageBuffer object is null",
         () -> OrzaVSMobileJNI.ImageBuffer_fillBuffer(0, null, new byte[4], 4));
     // A deleted proxy is an exception, not a crash; freeing twice is harmless.
     FrameROI roi = new FrameROI();
@@ -198,7 +190,7 @@ class RecordFamiliesTest {
 
     ByteArray body = new ByteArray();
     assertArrayEquals(new byte[0], new ByteArray(body).getData());
-    assertNullReference("OrzaVSMobile::ByteArray const & reference is null", () -> new ByteArray((ByteArray) null));
+    assertNpe("OrzaVSMobile::ByteArray const & reference is null", () -> new ByteArray((ByteArray) null));
     MapOfStringToString params = new MapOfStringToString();
     params.put("p", "1");
     MapOfStringToString metadata = new MapOfStringToString();
@@ -210,10 +202,10 @@ class RecordFamiliesTest {
     assertNull(full.getResponseHandler());
     assertEquals(0, new ServerRequest(body, "id-3", params).getMetadata().size());
     assertEquals(0, new ServerRequest(body, "id-2").getData().getLength());
-    assertNullReference("Tovra::Server::ServerRequest::ParamMap const & reference is null",
+    assertNpe("Tovra::Server::ServerRequest::ParamMap const & reference is null",
         () -> new ServerRequest(body, "x", null));
-    assertNullReference("OrzaVSMobile::ByteArray const & reference is null", () -> new ServerRequest(null, "x"));
-    assertNullReference("null string", () -> new ServerRequest(body, null));
+    assertNpe("OrzaVSMobile::ByteArray const & reference is null", () -> new ServerRequest(null, "x"));
+    assertNpe("null string", () -> new ServerRequest(body, null));
     MapOfStringToString view = full.getParams();
     full.clear();
     assertEquals("", full.getId());
@@ -233,8 +225,8 @@ class RecordFamiliesTest {
     result.setResultStr("kept");
     MobileUtils.testNeon(result);
     assertEquals("kept", result.getResultStr());
-    assertNullReference("NEONAccelerationResult & reference is null", () -> MobileUtils.testNeon(null));
-    assertNullReference("null string", () -> MobileUtils.setupLogging(null));
+    assertNpe("NEONAccelerationResult & reference is null", () -> MobileUtils.testNeon(null));
+    assertNpe("null string", () -> MobileUtils.setupLogging(null));
     for (int format = -1; format <= 7; format++) {
       assertEquals(format >= 0 && format <= 2, OrzaVSMobile.isYUVFormat(format));
     }

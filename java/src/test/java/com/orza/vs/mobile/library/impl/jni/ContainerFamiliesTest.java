@@ -1,12 +1,8 @@
 package com.orza.vs.mobile.library.impl.jni;
 
+import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertNpe;
 import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertThrowsWithMessage;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertNotEquals;
-import static org.junit.jupiter.api.Assertions.assertNull;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import java.util.ArrayList;
 import java.util.Arrays;
@@ -111,14 +107,12 @@ class ContainerFamiliesTest {
   void argumentChecksAndViewsOfRecordVectors() {
     assertThrows(IllegalArgumentException.class, () -> new VectorOfInt(-1));
     VectorOfString s = new VectorOfString(Arrays.asList("x", "\u00fc\u00df", ""));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> s.add(null));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> s.set(0, null));
+    assertNpe("null string", () -> s.add(null));
+    assertNpe("null string", () -> s.set(0, null));
     assertEquals(Arrays.asList("x", "\u00fc\u00df", ""), s);
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::vector< OrzaVSMobile::Point2< float > >::value_type const & reference is null",
+    assertNpe("std::vector< OrzaVSMobile::Point2< float > >::value_type const & reference is null",
         () -> new VectorOfPoint2f().add(null));
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::vector< Tovra::ObjectInfo >::value_type const & reference is null",
+    assertNpe("std::vector< Tovra::ObjectInfo >::value_type const & reference is null",
         () -> new VectorOfObjectInfo(1).set(0, null));
 
     // A record element is a view: it writes into the vector, and dies when the vector grows.
@@ -132,8 +126,7 @@ class ContainerFamiliesTest {
     assertEquals(5f, points.get(0).getY());
     points.add(new Point2f());
     IllegalStateException stale = assertThrows(IllegalStateException.class, view::getX);
-    assertTrue(stale.getMessage().contains("VectorOfPoint2f it was taken from has changed"),
-        stale.getMessage());
+    assertTrue(stale.getMessage().contains("VectorOfPoint2f it was taken from has changed"), stale.getMessage());
   }
 
   @Test
@@ -196,8 +189,8 @@ class ContainerFamiliesTest {
     assertNull(map.remove("none"));
     assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found", () -> map.at("none"));
     assertThrowsWithMessage(IndexOutOfBoundsException.class, "key not found", () -> map.del("none"));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> map.at(null));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> map.put(null, value.apply(1)));
+    assertNpe("null string", () -> map.at(null));
+    assertNpe("null string", () -> map.put(null, value.apply(1)));
 
     Map.Entry<String, V> first = map.entrySet().iterator().next();
     first.setValue(value.apply(8));

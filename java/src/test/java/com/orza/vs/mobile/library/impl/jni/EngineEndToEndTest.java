@@ -1,13 +1,9 @@
 package com.orza.vs.mobile.library.impl.jni;
 
-import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertThrowsWithMessage;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertNotNull;
-import static org.junit.jupiter.api.Assertions.assertSame;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertNpe;
+import static org.junit.jupiter.api.Assertions.*;
 
+import java.lang.ref.WeakReference;
 import java.nio.ByteBuffer;
 import java.util.ArrayList;
 import java.util.Collections;
@@ -49,9 +45,8 @@ class EngineEndToEndTest {
     public void didDecode(VectorOfObjectInfo objects, ResultMetadata metadata) {
       if (throwFromDecode != null) throw throwFromDecode;
       StringBuilder text = new StringBuilder(Thread.currentThread().getName());
-      text.append('|').append(metadata.getQueryID()).append('|')
-          .append(metadata.getIsFinalAccumulation()).append('|')
-          .append(metadata.getMobileDecorator()).append('|').append(metadata.getAccumulatedQueries());
+      text.append('|').append(metadata.getQueryID()).append('|').append(metadata.getIsFinalAccumulation())
+          .append('|').append(metadata.getMobileDecorator()).append('|').append(metadata.getAccumulatedQueries());
       for (ObjectInfo o : objects) {
         text.append('|').append(o.getSrcObjectModule()).append(' ').append(o.getContentType())
             .append(' ').append(o.getContent());
@@ -61,72 +56,63 @@ class EngineEndToEndTest {
       }
       decoded.add(text.toString());
     }
-
-    @Override
-    public void didReceiveServerError(ObjectModuleID module, ResponseStatus status, int code) {
-      decoded.add(Thread.currentThread().getName() + "|error " + module + " " + status + " " + code);
-    }
   }
 
-  /** A transport that answers REPLY from a thread of its own, or at once on the caller's. */
+  /**
+   * Answers REPLY from a thread of its own, or (answerAtOnce, answerThroughHandler) on the
+   * engine's worker before returning; throws {@code fail} when that is set.
+   */
   static class Transport extends ServerDelegate {
-    final ExecutorService executor = Executors.newSingleThreadExecutor(r -> {
-      Thread t = new Thread(r, "transport");
-      t.setDaemon(true);
-      return t;
-    });
+    final ExecutorService executor = Executors.newSingleThreadExecutor(r -> new Thread(r, "transport"));
     final LinkedBlockingQueue<String> sent = new LinkedBlockingQueue<String>();
     final LinkedBlockingQueue<Throwable> pushFailures = new LinkedBlockingQueue<Throwable>();
     volatile boolean answerAtOnce;
     volatile boolean answerThroughHandler;
+    volatile RuntimeException fail;
 
     @Override
     public boolean sendServerRequestImpl(ServerRequest request) {
-      if (answerAtOnce || answerThroughHandler) {
-        // Answer on the calling thread (the engine's worker), before returning.
-        ServerResponse response = new ServerResponse();
-        response.setId(request.getId());
-        response.setResponseStr(REPLY);
-        sent.add(request.getId() + "|at once|" + Thread.currentThread().getName());
-        if (answerThroughHandler) {
-          request.getResponseHandler().handleServerResponse(response);
-        } else {
-          pushServerResponse(response);
-        }
-        return true;
-      }
+      if (fail != null) throw fail;
       // The request is borrowed: copy what is needed before returning.
-      final String id = request.getId();
       byte[] jpeg = request.getData().getData();
-      boolean hasParams = request.getParams().has_key("vsearch_params_json");
-      sent.add(id + "|" + (jpeg.length > 2 && (jpeg[0] & 0xff) == 0xff && (jpeg[1] & 0xff) == 0xd8)
-          + "|" + hasParams + "|" + Thread.currentThread().getName());
-      executor.execute(() -> {
-        ServerResponse response = new ServerResponse();
-        response.setId(id);
-        response.setResponseStr(REPLY);
-        response.setRoundtripTime(0.01);
-        try {
-          pushServerResponse(response);
-        } catch (RuntimeException e) {
-          pushFailures.add(e);
-        }
-      });
+      boolean isJpeg = jpeg.length > 2 && (jpeg[0] & 0xff) == 0xff && (jpeg[1] & 0xff) == 0xd8;
+      sent.add(request.getId() + "|" + isJpeg + "|" + request.getParams().has_key("vsearch_params_json")
+          + "|" + Thread.currentThread().getName());
+      ServerResponse response = new ServerResponse();
+      response.setId(request.getId());
+      response.setResponseStr(REPLY);
+      if (answerThroughHandler) {
+        request.getResponseHandler().handleServerResponse(response);
+      } else if (answerAtOnce) {
+        pushServerResponse(response);
+      } else {
+        executor.execute(() -> {
+          try {
+            pushServerResponse(response);
+          } catch (RuntimeException e) {
+            pushFailures.add(e);
+          }
+        });
+      }
       return true;
     }
   }
 
-  Events events = new Events();
-  Transport transport = new Transport();
-  TovraStateEngineFacade engine = new TovraStateEngineFacade(events);
-  ImageBuffer image = new ImageBuffer();
-  ExtraFrameData extra = new ExtraFrameData();
-  ByteBuffer frame = ByteBuffer.allocateDirect(WIDTH * HEIGHT * 3 / 2);
+  final Events events = new Events();
+  final Transport transport = new Transport();
+  final TovraStateEngineFacade engine = new TovraStateEngineFacade(events);
+  final ImageBuffer image = new ImageBuffer();
+  final ExtraFrameData extra = new ExtraFrameData();
+  final ByteBuffer frame = ByteBuffer.allocateDirect(WIDTH * HEIGHT * 3 / 2);
   double time = 100.0;
 
   EngineEndToEndTest() {
     engine.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, transport);
-    fillFrame(frame, 0);
+    // A densely textured NV21 frame: a fixed pseudo-random luminance pattern, grey chroma.
+    for (int i = 0; i < frame.capacity(); i++) {
+      frame.put(i, (byte) (i < WIDTH * HEIGHT ? (i % WIDTH * 7919 + i / WIDTH * 104729) % 251 : 128));
+    }
+    describe(image);
   }
 
   @AfterEach
@@ -137,31 +123,22 @@ class EngineEndToEndTest {
     assertTrue(transport.executor.awaitTermination(5, TimeUnit.SECONDS));
   }
 
-  /** A densely textured NV21 frame (a fixed pseudo-random pattern), shifted by {@code shift}. */
-  static void fillFrame(ByteBuffer frame, int shift) {
-    for (int y = 0; y < HEIGHT; y++) {
-      for (int x = 0; x < WIDTH; x++) {
-        frame.put(y * WIDTH + x, (byte) (((x + shift) * 7919 + y * 104729) % 251));
-      }
-    }
-    for (int i = WIDTH * HEIGHT; i < frame.capacity(); i++) frame.put(i, (byte) 128);
-  }
-
-  /** One frame through the lent-buffer path; returns the frame key. */
-  String streamFrame() {
+  static void describe(ImageBuffer image) {
     image.setFormat(ImageFormat.NV21);
     image.setWidth(WIDTH);
     image.setHeight(HEIGHT);
     image.setWidthStep(WIDTH);
     image.setNumChannels(1);
+  }
+
+  /** One frame through the lent-buffer path. */
+  void streamFrame() {
     String[] key = new String[1];
     engine.requestImageBuffer(image, key);
     assertNotNull(key[0]);
     assertEquals(frame.capacity(), image.fillBufferWithByteBuffer(frame, frame.capacity()));
-    time += 0.2;
-    extra.setTimeStamp(time);
+    extra.setTimeStamp(time += 0.2);
     engine.process(key[0], image, extra);
-    return key[0];
   }
 
   /** Streams frames until the transport got a request, and takes that request. */
@@ -178,10 +155,7 @@ class EngineEndToEndTest {
   /** An image in memory of its own holding the test frame. */
   ImageBuffer ownFrame() {
     ImageBuffer own = new ImageBuffer();
-    own.setFormat(ImageFormat.NV21);
-    own.setWidth(WIDTH);
-    own.setHeight(HEIGHT);
-    own.setWidthStep(WIDTH);
+    describe(own);
     own.allocateBuffer(frame.capacity());
     assertEquals(frame.capacity(), own.fillBufferWithByteBuffer(frame, frame.capacity()));
     return own;
@@ -277,13 +251,13 @@ class EngineEndToEndTest {
 
   @Test
   void theEngineHoldsItsDelegatesUntilItIsDeleted() {
-    Events held = new Events();
-    Transport heldTransport = new Transport();
+    EventDelegateBase held = new EventDelegateBase();
+    ServerDelegate heldTransport = new ServerDelegate();
     TovraStateEngineFacade other = new TovraStateEngineFacade(held);
     other.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, heldTransport);
     assertFalse(held.swigCMemOwn, "the engine owns its delegate while it lives");
     assertFalse(heldTransport.swigCMemOwn);
-    java.lang.ref.WeakReference<Events> ref = new java.lang.ref.WeakReference<Events>(held);
+    WeakReference<EventDelegateBase> ref = new WeakReference<EventDelegateBase>(held);
     held = null;
     for (int i = 0; i < 5; i++) System.gc();
     assertNotNull(ref.get(), "a delegate in use is not collected");
@@ -293,16 +267,12 @@ class EngineEndToEndTest {
     assertTrue(ref.get().swigCMemOwn, "ownership is handed back");
     assertEquals(0, ServerDelegate.getCPtr(heldTransport));
     ref.get().delete();
-    heldTransport.executor.shutdown();
   }
 
   private static void abandonRunningEngine() {
-    Events abandoned = new Events();
-    Transport abandonedTransport = new Transport();
-    abandonedTransport.executor.shutdown();
-    TovraStateEngineFacade engine = new TovraStateEngineFacade(abandoned);
-    engine.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, abandonedTransport);
-    engine.startEngine();
+    TovraStateEngineFacade abandoned = new TovraStateEngineFacade(new EventDelegateBase());
+    abandoned.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, new ServerDelegate());
+    abandoned.startEngine();
   }
 
   @Test
@@ -332,24 +302,16 @@ class EngineEndToEndTest {
     engine.pauseEngine();
     engine.resumeEngine();
 
-    assertThrowsWithMessage(NullPointerException.class,
-        "Tovra::CameraResRequirement & reference is null", () -> engine.getCameraResRequirement(null));
-    assertThrowsWithMessage(NullPointerException.class,
-        "OrzaVSMobile::ImageBuffer & reference is null", () -> engine.process(null, extra));
-    assertThrowsWithMessage(NullPointerException.class,
-        "OrzaVSMobile::ExtraFrameData & reference is null", () -> engine.process("k", image, null));
-    assertThrowsWithMessage(NullPointerException.class, "null string",
-        () -> engine.process(null, image, extra));
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::map< std::string,std::string > const & reference is null",
+    assertNpe("Tovra::CameraResRequirement & reference is null", () -> engine.getCameraResRequirement(null));
+    assertNpe("OrzaVSMobile::ImageBuffer & reference is null", () -> engine.process(null, extra));
+    assertNpe("OrzaVSMobile::ExtraFrameData & reference is null", () -> engine.process("k", image, null));
+    assertNpe("null string", () -> engine.process(null, image, extra));
+    assertNpe("std::map< std::string,std::string > const & reference is null",
         () -> engine.readObjectModuleProps(null));
-    assertThrowsWithMessage(NullPointerException.class,
-        "std::map< std::string,unsigned int > & reference is null",
-        () -> engine.getAndClearMetrics(null, values));
-    assertThrowsWithMessage(NullPointerException.class, "null string", () -> engine.readProps(null));
+    assertNpe("std::map< std::string,unsigned int > & reference is null", () -> engine.getAndClearMetrics(null, values));
+    assertNpe("null string", () -> engine.readProps(null));
     assertThrows(NullPointerException.class, () -> engine.requestImageBuffer(image, null));
-    assertThrows(IndexOutOfBoundsException.class,
-        () -> engine.requestImageBuffer(image, new String[0]));
+    assertThrows(IndexOutOfBoundsException.class, () -> engine.requestImageBuffer(image, new String[0]));
 
     // Stopped: no buffer is lent and the key stays as it was.
     engine.stopEngine();
@@ -362,5 +324,31 @@ class EngineEndToEndTest {
     other.delete();
     assertThrows(NullPointerException.class, other::startEngine);
     other.close();
+  }
+
+  @Test
+  void diagnosticLinesReachAListenerOnTheCallersAndOnTheWorkersThread() throws InterruptedException {
+    LinkedBlockingQueue<String> lines = new LinkedBlockingQueue<String>();
+    Thread caller = Thread.currentThread();
+    transport.fail = new IllegalStateException("no network");
+    ImageBuffer own = ownFrame();
+    Diagnostics.setListener(line -> {
+      lines.add((Thread.currentThread() == caller ? "caller: " : "worker: ") + line);
+      throw new IllegalStateException("a failing listener is ignored");
+    });
+    try {
+      engine.process(own, extra);  // not started
+      assertEquals("caller: Skipped input frame: TSE not in RUNNING state", lines.poll());
+      engine.startEngine();
+      // Sent from the worker, where the transport throws: the line comes from that native
+      // thread, which the listener's call has to attach to the VM.
+      engine.process(own, extra);
+      assertEquals("worker: Visual search request failed: no network", lines.poll(20, TimeUnit.SECONDS));
+    } finally {
+      Diagnostics.setListener(null);
+    }
+    engine.stopEngine();
+    engine.process(own, extra);  // to standard output again
+    assertNull(lines.poll());
   }
 }

@@ -54,21 +54,10 @@ class VisualSearchSessionTest {
 
   final Transport transport = new Transport();
   final List<Object> heard = new ArrayList<Object>();
-  final SessionListener listener = new SessionListener() {
-    @Override
-    public void onInterestPoints(float[] xy) {
-      heard.add(xy);
-    }
-
-    @Override
-    public void onResults(SearchResults results) {
-      heard.add(results);
-    }
-
-    @Override
-    public void onServerError(ResponseStatus status, int code) {
-      heard.add(code);
-    }
+  final SessionListener listener = new SessionListener() {  // keeps all it hears, in order
+    @Override public void onInterestPoints(float[] xy) { heard.add(xy); }
+    @Override public void onResults(SearchResults results) { heard.add(results); }
+    @Override public void onServerError(ResponseStatus status, int code) { heard.add(code); }
   };
   final VisualSearchSession session = VisualSearchSession.builder().transport(transport).listener(listener).build();
   final byte[] y = new byte[W * H];
@@ -89,11 +78,8 @@ class VisualSearchSessionTest {
   }
 
   byte[] nv21() {
-    byte[] out = Arrays.copyOf(y, W * H * 3 / 2);
-    for (int i = 0; i < u.length; i++) {
-      out[W * H + 2 * i] = v[i];
-      out[W * H + 2 * i + 1] = u[i];
-    }
+    byte[] out = new byte[W * H * 3 / 2];
+    planes(LAYOUTS[0])[0].get(out);  // NV21 in one block
     return out;
   }
 

@@ -297,30 +297,17 @@ class DirectorTest {
     alive.delete();  // nothing left to free
   }
 
-  static class Transport extends ServerDelegate {
-    final List<String> ids = Collections.synchronizedList(new ArrayList<String>());
-    volatile RuntimeException fail;
-    volatile ServerRequest last;
-
-    @Override
-    public boolean sendServerRequestImpl(ServerRequest request) {
-      last = request;
-      if (fail != null) throw fail;
-      return ids.add(request.getId() + "@" + Thread.currentThread().getName());
-    }
-  }
-
   @Test
   void serverDelegateReachesTheJavaTransport() throws Throwable {
-    Transport t = new Transport();
+    TestTransport t = new TestTransport();
     long h = ServerDelegate.getCPtr(t);
     ServerRequest request = new ServerRequest();
     request.setId("r-1");
     // Not overridden: the base sendServerRequest registers and calls the Java Impl.
     assertTrue(OrzaVSMobileJNI.ServerDelegate_sendServerRequest(h, t, ServerRequest.getCPtr(request), request));
     assertTrue(t.sendServerRequest(request));
-    assertEquals(2, t.ids.size());
-    assertTrue(t.ids.get(0).startsWith("r-1@"));
+    assertEquals(2, t.sent.size());
+    assertTrue(t.sent.poll().startsWith("r-1|"));
     assertEquals("detached-before;result=true;detached-after", NativeTestHooks.sendRequestOnNativeThread(h, "r-2"));
     // A request handed to the transport is borrowed for the call only.
     assertThrows(IllegalStateException.class, t.last::getId);
@@ -387,7 +374,7 @@ class DirectorTest {
         () -> superCaller.sendServerRequest(request));
 
     // Destroying through the interface disconnects the Java transport.
-    Transport t = new Transport();
+    TestTransport t = new TestTransport();
     long h = ServerDelegate.getCPtr(t);
     t.swigReleaseOwnership();
     try (ServerDelegateInterface owner = new ServerDelegateInterface(OrzaVSMobileJNI.ServerDelegate_SWIGUpcast(h), true)) {

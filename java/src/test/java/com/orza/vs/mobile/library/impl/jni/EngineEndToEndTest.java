@@ -8,8 +8,6 @@ import java.nio.ByteBuffer;
 import java.util.ArrayList;
 import java.util.Collections;
 import java.util.List;
-import java.util.concurrent.ExecutorService;
-import java.util.concurrent.Executors;
 import java.util.concurrent.LinkedBlockingQueue;
 import java.util.concurrent.TimeUnit;
 import org.junit.jupiter.api.AfterEach;
@@ -19,13 +17,6 @@ import org.junit.jupiter.api.Test;
 class EngineEndToEndTest {
   static final int WIDTH = 320;
   static final int HEIGHT = 240;
-  static final String REPLY = "{\"queryId\":\"q-1\",\"quillmark\":{\"searchResult\":["
-      + "{\"content\":\"shoe\",\"contentType\":\"PIDN\",\"properties\":{\"brand\":\"x\"}},"
-      + "{\"content\":\"\",\"contentType\":\"BoundingBox\",\"properties\":{\"boundingBox\":"
-      + "{\"tlx\":10,\"tly\":20,\"trx\":110,\"try\":20,\"brx\":110,\"bry\":90,\"blx\":10,\"bly\":90}}},"
-      + "{\"content\":\"dropped\",\"contentType\":\"Unknown\",\"properties\":{}}],"
-      + "\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[\"q-0\"]}}}";
-
   /** What the app's delegate saw, copied out of the borrowed arguments. */
   static class Events extends EventDelegateBase {
     final LinkedBlockingQueue<String> decoded = new LinkedBlockingQueue<String>();
@@ -58,48 +49,8 @@ class EngineEndToEndTest {
     }
   }
 
-  /**
-   * Answers REPLY from a thread of its own, or (answerAtOnce, answerThroughHandler) on the
-   * engine's worker before returning; throws {@code fail} when that is set.
-   */
-  static class Transport extends ServerDelegate {
-    final ExecutorService executor = Executors.newSingleThreadExecutor(r -> new Thread(r, "transport"));
-    final LinkedBlockingQueue<String> sent = new LinkedBlockingQueue<String>();
-    final LinkedBlockingQueue<Throwable> pushFailures = new LinkedBlockingQueue<Throwable>();
-    volatile boolean answerAtOnce;
-    volatile boolean answerThroughHandler;
-    volatile RuntimeException fail;
-
-    @Override
-    public boolean sendServerRequestImpl(ServerRequest request) {
-      if (fail != null) throw fail;
-      // The request is borrowed: copy what is needed before returning.
-      byte[] jpeg = request.getData().getData();
-      boolean isJpeg = jpeg.length > 2 && (jpeg[0] & 0xff) == 0xff && (jpeg[1] & 0xff) == 0xd8;
-      sent.add(request.getId() + "|" + isJpeg + "|" + request.getParams().has_key("vsearch_params_json")
-          + "|" + Thread.currentThread().getName());
-      ServerResponse response = new ServerResponse();
-      response.setId(request.getId());
-      response.setResponseStr(REPLY);
-      if (answerThroughHandler) {
-        request.getResponseHandler().handleServerResponse(response);
-      } else if (answerAtOnce) {
-        pushServerResponse(response);
-      } else {
-        executor.execute(() -> {
-          try {
-            pushServerResponse(response);
-          } catch (RuntimeException e) {
-            pushFailures.add(e);
-          }
-        });
-      }
-      return true;
-    }
-  }
-
   final Events events = new Events();
-  final Transport transport = new Transport();
+  final TestTransport transport = new TestTransport();
   final TovraStateEngineFacade engine = new TovraStateEngineFacade(events);
   final ImageBuffer image = new ImageBuffer();
   final ExtraFrameData extra = new ExtraFrameData();
@@ -116,11 +67,9 @@ class EngineEndToEndTest {
   }
 
   @AfterEach
-  void tearDown() throws Exception {
+  void tearDown() {
     engine.close();
     engine.close();  // once only
-    transport.executor.shutdown();
-    assertTrue(transport.executor.awaitTermination(5, TimeUnit.SECONDS));
   }
 
   static void describe(ImageBuffer image) {
@@ -175,27 +124,25 @@ class EngineEndToEndTest {
     assertTrue(parts[0].startsWith("TovraStateEngine-"), sent);
     assertEquals("true", parts[1], "the body is a JPEG");
     assertEquals("true", parts[2], "the request carries vsearch_params_json");
-    assertFalse(parts[3].equals(Thread.currentThread().getName()), "sent from the engine's worker");
+    assertNotEquals(Thread.currentThread().getName(), parts[3], "sent from the engine's worker");
+    assertSame(Thread.currentThread(), events.pointThreads.get(0), "interest points arrive on the thread that called process");
+    assertTrue(events.lastPointCount > 0 && events.lastPointCount <= 50, "points: " + events.lastPointCount);
 
-    assertEquals("transport|q-1|true|TeskarMobileDecorator|[q-0]"
+    // The results arrive on the thread that pushes the reply, before the push returns.
+    transport.answer(200, TestTransport.REPLY);
+    assertEquals(Thread.currentThread().getName() + "|q-1|true|TeskarMobileDecorator|[q-0]"
         + "|VISUAL_SEARCH_SERVICE_MOD PIDN shoe"
-        + "|VISUAL_SEARCH_SERVICE_MOD BOUNDING_BOX  (10,20) (110,20) (110,90) (10,90)",
-        nextEvent());
-    assertSame(Thread.currentThread(), events.pointThreads.get(0),
-        "interest points arrive on the thread that called process");
-    assertTrue(events.lastPointCount > 0 && events.lastPointCount <= 50,
-        "points: " + events.lastPointCount);
-
-    // (A failed exchange as a server error: EngineOverHttpTest, over HTTP.)
+        + "|VISUAL_SEARCH_SERVICE_MOD BOUNDING_BOX  (10,20) (110,20) (110,90) (10,90)", events.decoded.poll());
     // A failing didDecode: the transport's pushServerResponse throws that very exception.
     events.throwFromDecode = new IllegalStateException("app failure", new Error("cause"));
     streamUntilSent();
-    assertSame(events.throwFromDecode, transport.pushFailures.poll(10, TimeUnit.SECONDS));
+    assertSame(events.throwFromDecode,
+        assertThrows(IllegalStateException.class, () -> transport.answer(200, TestTransport.REPLY)));
   }
 
   @Test
   void aTransportAnsweringOnTheWorkerDeliversResultsThere() throws Exception {
-    transport.answerAtOnce = true;
+    transport.mode = TestTransport.Mode.PUSHED_AT_ONCE;
     engine.startEngine();
     String sent = streamUntilSent();
     String event = nextEvent();
@@ -204,8 +151,7 @@ class EngineEndToEndTest {
     assertFalse(worker.equals(Thread.currentThread().getName()));
 
     // The response handler of a request can be called directly as well.
-    transport.answerAtOnce = false;
-    transport.answerThroughHandler = true;
+    transport.mode = TestTransport.Mode.THROUGH_HANDLER_AT_ONCE;
     streamUntilSent();
     assertTrue(nextEvent().contains("|q-1|true|"));
     ServerResponseHandler none = new ServerResponseHandler(0, false);
@@ -241,9 +187,9 @@ class EngineEndToEndTest {
 
   @Test
   void singleImageReturnsAfterItsReplyWasHandled() throws Exception {
+    transport.mode = TestTransport.Mode.PUSHED_FROM_OWN_THREAD;
     engine.startEngine();
-    ImageBuffer still = ownFrame();
-    engine.processSingleImage(still, extra);
+    engine.processSingleImage(ownFrame(), extra);
     String event = events.decoded.poll();
     assertNotNull(event, "the reply was handled before processSingleImage returned");
     assertTrue(event.startsWith("transport|q-1|"), event);

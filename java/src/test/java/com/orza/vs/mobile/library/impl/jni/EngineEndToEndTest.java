@@ -3,7 +3,6 @@ package com.orza.vs.mobile.library.impl.jni;
 import static com.orza.vs.mobile.library.impl.jni.RecordFamiliesTest.assertNpe;
 import static org.junit.jupiter.api.Assertions.*;
 
-import java.lang.ref.WeakReference;
 import java.nio.ByteBuffer;
 import java.util.ArrayList;
 import java.util.Collections;
@@ -17,6 +16,7 @@ import org.junit.jupiter.api.Test;
 class EngineEndToEndTest {
   static final int WIDTH = 320;
   static final int HEIGHT = 240;
+
   /** What the app's delegate saw, copied out of the borrowed arguments. */
   static class Events extends EventDelegateBase {
     final LinkedBlockingQueue<String> decoded = new LinkedBlockingQueue<String>();
@@ -41,9 +41,7 @@ class EngineEndToEndTest {
       for (ObjectInfo o : objects) {
         text.append('|').append(o.getSrcObjectModule()).append(' ').append(o.getContentType())
             .append(' ').append(o.getContent());
-        for (Point2f p : o.getLocation()) {
-          text.append(" (").append((int) p.getX()).append(',').append((int) p.getY()).append(')');
-        }
+        for (Point2f p : o.getLocation()) text.append(String.format(" (%.0f,%.0f)", p.getX(), p.getY()));
       }
       decoded.add(text.toString());
     }
@@ -125,7 +123,8 @@ class EngineEndToEndTest {
     assertEquals("true", parts[1], "the body is a JPEG");
     assertEquals("true", parts[2], "the request carries vsearch_params_json");
     assertNotEquals(Thread.currentThread().getName(), parts[3], "sent from the engine's worker");
-    assertSame(Thread.currentThread(), events.pointThreads.get(0), "interest points arrive on the thread that called process");
+    assertSame(Thread.currentThread(), events.pointThreads.get(0),
+        "interest points arrive on the thread that called process");
     assertTrue(events.lastPointCount > 0 && events.lastPointCount <= 50, "points: " + events.lastPointCount);
 
     // The results arrive on the thread that pushes the reply, before the push returns.
@@ -159,20 +158,6 @@ class EngineEndToEndTest {
   }
 
   @Test
-  void framesInTheCallersOwnMemory() {
-    engine.startEngine();
-    ImageBuffer own = ownFrame();
-    extra.setTimeStamp(time += 0.2);
-    engine.process(own, extra);
-    assertEquals(1, events.pointThreads.size());
-    assertTrue(events.lastPointCount > 0);
-    // A geometry larger than the buffer holds is refused by the engine, not read.
-    own.setHeight(HEIGHT * 4);
-    engine.process(own, extra);
-    assertEquals(1, events.pointThreads.size());
-  }
-
-  @Test
   void aThrowingCallbackReturnsToTheCallerAndTheEngineGoesOn() throws Exception {
     engine.startEngine();
     events.throwFromPoints = new IllegalStateException("no thanks");
@@ -195,26 +180,6 @@ class EngineEndToEndTest {
     assertTrue(event.startsWith("transport|q-1|"), event);
   }
 
-  @Test
-  void theEngineHoldsItsDelegatesUntilItIsDeleted() {
-    EventDelegateBase held = new EventDelegateBase();
-    ServerDelegate heldTransport = new ServerDelegate();
-    TovraStateEngineFacade other = new TovraStateEngineFacade(held);
-    other.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, heldTransport);
-    assertFalse(held.swigCMemOwn, "the engine owns its delegate while it lives");
-    assertFalse(heldTransport.swigCMemOwn);
-    WeakReference<EventDelegateBase> ref = new WeakReference<EventDelegateBase>(held);
-    held = null;
-    for (int i = 0; i < 5; i++) System.gc();
-    assertNotNull(ref.get(), "a delegate in use is not collected");
-    heldTransport.delete();  // deleted too early: its native object lives until the engine goes
-    other.startEngine();
-    other.delete();
-    assertTrue(ref.get().swigCMemOwn, "ownership is handed back");
-    assertEquals(0, ServerDelegate.getCPtr(heldTransport));
-    ref.get().delete();
-  }
-
   private static void abandonRunningEngine() {
     TovraStateEngineFacade abandoned = new TovraStateEngineFacade(new EventDelegateBase());
     abandoned.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, new ServerDelegate());
@@ -222,9 +187,22 @@ class EngineEndToEndTest {
   }
 
   @Test
-  void anAbandonedEngineIsFinalizedBeforeItsDelegates() {
-    // Engine and delegates become unreachable together; whatever order their finalizers run
-    // in, the delegates' native objects outlive the engine.
+  void theEngineHoldsItsDelegatesUntilItIsDeletedOrFinalized() {
+    EventDelegateBase held = new EventDelegateBase();
+    ServerDelegate heldTransport = new ServerDelegate();
+    TovraStateEngineFacade other = new TovraStateEngineFacade(held);
+    other.addObjectModule(ObjectModuleID.VISUAL_SEARCH_SERVICE_MOD, heldTransport);
+    assertFalse(held.swigCMemOwn, "the engine owns its delegates while it lives");
+    assertFalse(heldTransport.swigCMemOwn);
+    heldTransport.delete();  // deleted too early: its native object lives until the engine goes
+    other.startEngine();
+    other.delete();
+    assertTrue(held.swigCMemOwn, "ownership is handed back");
+    assertEquals(0, ServerDelegate.getCPtr(heldTransport));
+    held.delete();
+
+    // Engines and delegates unreachable together: whatever order their finalizers run in, the
+    // delegates' native objects outlive the engine.
     for (int round = 0; round < 3; round++) abandonRunningEngine();
     for (int i = 0; i < 10; i++) {
       System.gc();
@@ -273,7 +251,7 @@ class EngineEndToEndTest {
   }
 
   @Test
-  void diagnosticLinesReachAListenerOnTheCallersAndOnTheWorkersThread() throws InterruptedException {
+  void framesInTheCallersOwnMemoryAndTheDiagnosticLinesTheyCause() throws InterruptedException {
     LinkedBlockingQueue<String> lines = new LinkedBlockingQueue<String>();
     Thread caller = Thread.currentThread();
     transport.fail = new IllegalStateException("no network");
@@ -289,7 +267,15 @@ class EngineEndToEndTest {
       // Sent from the worker, where the transport throws: the line comes from that native
       // thread, which the listener's call has to attach to the VM.
       engine.process(own, extra);
+      assertEquals(1, events.pointThreads.size());
+      assertTrue(events.lastPointCount > 0);
       assertEquals("worker: Visual search request failed: no network", lines.poll(20, TimeUnit.SECONDS));
+      // A geometry larger than the buffer holds is refused, not read.
+      own.setHeight(HEIGHT * 4);
+      engine.process(own, extra);
+      assertEquals("caller: Skipped input frame: image buffer holds 115200 bytes,"
+          + " a 320x960 image needs 307200", lines.poll());
+      assertEquals(1, events.pointThreads.size());
     } finally {
       Diagnostics.setListener(null);
     }

@@ -85,10 +85,6 @@ class DirectorTest {
     }
   }
 
-  static long handle(EventDelegateBase d) {
-    return EventDelegateBase.getCPtr(d);
-  }
-
   /** Runs {@code body} with a callback exception handler; returns what the handler received. */
   static List<Throwable> callbackExceptionsDuring(Executable body) throws Throwable {
     List<Throwable> handled = Collections.synchronizedList(new ArrayList<Throwable>());
@@ -104,7 +100,7 @@ class DirectorTest {
   @Test
   void everyEventReachesTheJavaOverrideThroughTheNativeDelegate() {
     Recorder r = new Recorder();
-    long h = handle(r);
+    long h = EventDelegateBase.getCPtr(r);
     OrzaVSMobileJNI.EventDelegateBase_didReceiveEvent(h, r, 1, 10, 0, 1);
     OrzaVSMobileJNI.EventDelegateBase_didProcessFrame(h, r, 6, 0, 1L << 40, -7);
     VectorOfObjectInfo objects = new VectorOfObjectInfo(2);
@@ -129,17 +125,10 @@ class DirectorTest {
     List<String> expected = Arrays.asList(
         "event VISUAL_SEARCH_SERVICE_MOD BOUNDING_BOX NO_ACTION FAILURE_STATUS",
         "frame UNSPECIFIED_OBJECT_MOD SUCCESS_STATUS 1099511627776 -7",
-        "detect 2",
-        "decode q7 []",
-        "points 3",
+        "detect 2", "decode q7 []", "points 3",
         "error VISUAL_SEARCH_SERVICE_MOD RESPONSE_PARSE_ERROR 200",
-        "dark",
-        "boring",
-        "message []",
-        "message [gr\u00fc\u00df \ud83d\ude00]",
-        "decision NO_STABILITY_ISSUE 0.75",
-        "module RESERVED_MOD NO_VERDICT",
-        "event null null null null");
+        "dark", "boring", "message []", "message [gr\u00fc\u00df \ud83d\ude00]",
+        "decision NO_STABILITY_ISSUE 0.75", "module RESERVED_MOD NO_VERDICT", "event null null null null");
     assertEquals(expected, r.calls);
     assertSame(Thread.currentThread(), r.lastThread);
 
@@ -167,8 +156,9 @@ class DirectorTest {
     };
     VectorOfObjectInfo objects = new VectorOfObjectInfo(1);
     ResultMetadata metadata = new ResultMetadata();
-    OrzaVSMobileJNI.EventDelegateBase_didDetect(handle(d), d, VectorOfObjectInfo.getCPtr(objects), objects);
-    OrzaVSMobileJNI.EventDelegateBase_didDecode(handle(d), d, VectorOfObjectInfo.getCPtr(objects), objects,
+    long h = EventDelegateBase.getCPtr(d);
+    OrzaVSMobileJNI.EventDelegateBase_didDetect(h, d, VectorOfObjectInfo.getCPtr(objects), objects);
+    OrzaVSMobileJNI.EventDelegateBase_didDecode(h, d, VectorOfObjectInfo.getCPtr(objects), objects,
         ResultMetadata.getCPtr(metadata), metadata);
     assertEquals(Collections.singletonList("decode 1"), calls);
 
@@ -198,7 +188,7 @@ class DirectorTest {
   @Test
   void callbackExceptionsReachTheJavaCallerAsTheSameObject() throws Throwable {
     Recorder t = new Recorder();
-    long h = handle(t);
+    long h = EventDelegateBase.getCPtr(t);
     VectorOfObjectInfo none = new VectorOfObjectInfo();
     ResultMetadata metadata = new ResultMetadata();
     List<Throwable> thrown = appExceptions();
@@ -219,7 +209,7 @@ class DirectorTest {
   @Test
   void nativeThreadsAreAttachedForOneUpcallAndBorrowedArgumentsEndWithIt() throws Exception {
     Recorder r = new Recorder();
-    long h = handle(r);
+    long h = EventDelegateBase.getCPtr(r);
     assertEquals("detached-before;called;detached-after", NativeTestHooks.showMessageOnNativeThread(h, "one"));
     Thread first = r.lastThread;
     assertEquals("detached-before;called;detached-after", NativeTestHooks.didDecodeOnNativeThread(h, 2, "q9"));
@@ -251,9 +241,25 @@ class DirectorTest {
   }
 
   @Test
-  void collectedJavaObjectRaisesTheNullUpcallError() {
+  void theNativeDelegateHoldsItsJavaObjectStronglyOnlyWhileItOwnsIt() {
+    Recorder owned = new Recorder();
+    long ownedAt = EventDelegateBase.getCPtr(owned);
+    owned.swigReleaseOwnership();  // native code now owns the delegate and holds its object strongly
+    WeakReference<Recorder> strong = new WeakReference<Recorder>(owned);
+    owned = null;
+    for (int i = 0; i < 5; i++) System.gc();
+    Recorder alive = strong.get();
+    assertNotNull(alive, "a strongly held Java object is not collected");
+    alive.swigTakeOwnership();
+    assertTrue(alive.swigCMemOwn);
+    // Destroying the native delegate disconnects the proxy: it forgets its handle.
+    OrzaVSMobileJNI.delete_EventDelegateBase(ownedAt);
+    assertEquals(0, EventDelegateBase.getCPtr(alive));
+    alive.delete();  // nothing left to free
+
+    // Owned by Java, the object is held weakly: once collected, a call raises the null-upcall error.
     Recorder r = new Recorder();
-    long h = handle(r);
+    long h = EventDelegateBase.getCPtr(r);
     r.swigCMemOwn = false;  // the native delegate outlives its Java object
     WeakReference<Recorder> ref = new WeakReference<Recorder>(r);
     r = null;
@@ -277,24 +283,6 @@ class DirectorTest {
     assertEquals("null upcall object in Tovra::EventDelegateBase::didDecode ", seen.getMessage());
     assertEquals("detached-before;called;detached-after", NativeTestHooks.showMessageOnNativeThread(h, "nobody"));
     OrzaVSMobileJNI.delete_EventDelegateBase(h);
-  }
-
-  @Test
-  void ownershipChangesTheReferenceKind() {
-    Recorder r = new Recorder();
-    long h = handle(r);
-    r.swigReleaseOwnership();  // native code now owns the delegate and holds r strongly
-    WeakReference<Recorder> ref = new WeakReference<Recorder>(r);
-    r = null;
-    for (int i = 0; i < 5; i++) System.gc();
-    Recorder alive = ref.get();
-    assertNotNull(alive, "a strongly held Java object is not collected");
-    alive.swigTakeOwnership();
-    assertTrue(alive.swigCMemOwn);
-    // Destroying the native delegate disconnects the proxy: it forgets its handle.
-    OrzaVSMobileJNI.delete_EventDelegateBase(h);
-    assertEquals(0, EventDelegateBase.getCPtr(alive));
-    alive.delete();  // nothing left to free
   }
 
   @Test
@@ -324,9 +312,7 @@ class DirectorTest {
 
     assertNpe("Tovra::Server::ServerRequest const & reference is null", () -> t.sendServerRequest(null));
     assertNpe("Tovra::Server::ServerResponse const & reference is null", () -> t.pushServerResponse(null));
-    ServerResponse unknown = new ServerResponse();
-    unknown.setId("never-sent");
-    t.pushServerResponse(unknown);  // ignored
+    t.pushServerResponse(TestTransport.response("never-sent", 200, ""));  // an unknown id is ignored
     t.close();
     assertEquals(0, ServerDelegate.getCPtr(t));
   }

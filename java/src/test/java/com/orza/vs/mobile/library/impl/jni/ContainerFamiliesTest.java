@@ -52,7 +52,7 @@ class ContainerFamiliesTest {
   @ParameterizedTest(name = "{0}")
   @MethodSource("vectors")
   <E> void vectorsAreLists(String name, Supplier<NativeList<E>> make, Function<Integer, E> element,
-                           Function<E, Integer> read, E defaultValue) {
+                           Function<E, Integer> read, E defaultValue) throws ReflectiveOperationException {
     try (NativeList<E> v = make.get()) {
       assertTrue(v.isEmpty());
       v.reserve(10);
@@ -98,8 +98,6 @@ class ContainerFamiliesTest {
       assertThrows(IllegalArgumentException.class, () -> v.reserve(-1));
       v.delete();
       assertThrows(IllegalStateException.class, v::size);
-    } catch (ReflectiveOperationException e) {
-      throw new AssertionError(e);
     }
   }
 
@@ -150,17 +148,15 @@ class ContainerFamiliesTest {
     assertEquals(ContentType.PIDN, copy.getContentType());
   }
 
-  /** Each map type with a value made from an int. */
+  /** Each map type with a value made from an int (named by the message of a null copy). */
   static Stream<Arguments> maps() {
-    return Stream.of(
-        Arguments.of("std::map< std::string,std::string > const & reference is null",
-            (Supplier<NativeMap<?>>) MapOfStringToString::new,
-            (Function<Integer, Object>) i -> "v" + i),
-        Arguments.of("std::map< std::string,unsigned int > const & reference is null",
-            (Supplier<NativeMap<?>>) MapOfStringToUInt::new, (Function<Integer, Object>) i -> (long) i),
-        Arguments.of("std::map< std::string,double > const & reference is null",
-            (Supplier<NativeMap<?>>) MapOfStringToDouble::new,
-            (Function<Integer, Object>) i -> i + 0.25));
+    return Stream.of(map("std::string", MapOfStringToString::new, i -> "v" + i),
+        map("unsigned int", MapOfStringToUInt::new, i -> (long) i),
+        map("double", MapOfStringToDouble::new, i -> i + 0.25));
+  }
+
+  static <V> Arguments map(String valueType, Supplier<NativeMap<V>> make, Function<Integer, V> value) {
+    return Arguments.of("std::map< std::string," + valueType + " > const & reference is null", make, value);
   }
 
   @ParameterizedTest(name = "{0}")

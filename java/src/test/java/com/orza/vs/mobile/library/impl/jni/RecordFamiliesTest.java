@@ -118,7 +118,7 @@ class RecordFamiliesTest {
   }
 
   @Test
-  void imageBufferAllocationAndFills() {
+  void imageBufferFillsStayInsideMemoryTheBufferWasGiven() {
     ImageBuffer empty = new ImageBuffer();
     assertEquals(ImageFormat.NV21, empty.getFormat());
     assertEquals(0, empty.fillBuffer(new byte[10], 10));
@@ -146,10 +146,7 @@ class RecordFamiliesTest {
     assertEquals(0, buffer.getAllocLen());
     assertEquals(SWIGTYPE_p_unsigned_char.getCPtr(before), SWIGTYPE_p_unsigned_char.getCPtr(buffer.getData()));
     assertEquals(0, buffer.fillBuffer(source, 10));
-  }
 
-  @Test
-  void imageBufferDataAndAllocLenCannotOpenForeignMemory() {
     ImageBuffer owner = new ImageBuffer();
     owner.allocateBuffer(64);
     ImageBuffer other = new ImageBuffer();

@@ -50,7 +50,7 @@ class EngineEndToEndTest {
   final Events events = new Events();
   final TestTransport transport = new TestTransport();
   final TovraStateEngineFacade engine = new TovraStateEngineFacade(events);
-  final ImageBuffer image = new ImageBuffer();
+  final ImageBuffer image = emptyFrame();
   final ExtraFrameData extra = new ExtraFrameData();
   final ByteBuffer frame = ByteBuffer.allocateDirect(WIDTH * HEIGHT * 3 / 2);
   double time = 100.0;
@@ -61,7 +61,6 @@ class EngineEndToEndTest {
     for (int i = 0; i < frame.capacity(); i++) {
       frame.put(i, (byte) (i < WIDTH * HEIGHT ? (i % WIDTH * 7919 + i / WIDTH * 104729) % 251 : 128));
     }
-    describe(image);
   }
 
   @AfterEach
@@ -70,12 +69,9 @@ class EngineEndToEndTest {
     engine.close();  // once only
   }
 
-  static void describe(ImageBuffer image) {
-    image.setFormat(ImageFormat.NV21);
-    image.setWidth(WIDTH);
-    image.setHeight(HEIGHT);
-    image.setWidthStep(WIDTH);
-    image.setNumChannels(1);
+  /** An NV21 image of the test frame's geometry, without memory. */
+  static ImageBuffer emptyFrame() {
+    return new ImageBuffer(0, ImageFormat.NV21, WIDTH, HEIGHT, WIDTH, 1, null);
   }
 
   /** One frame through the lent-buffer path. */
@@ -101,8 +97,7 @@ class EngineEndToEndTest {
 
   /** An image in memory of its own holding the test frame. */
   ImageBuffer ownFrame() {
-    ImageBuffer own = new ImageBuffer();
-    describe(own);
+    ImageBuffer own = emptyFrame();
     own.allocateBuffer(frame.capacity());
     assertEquals(frame.capacity(), own.fillBufferWithByteBuffer(frame, frame.capacity()));
     return own;

@@ -207,9 +207,7 @@ class ContainerFamiliesTest {
     Throwable e = assertThrows(java.lang.reflect.InvocationTargetException.class,
         () -> type.getConstructor(type).newInstance((Object) null));
     assertEquals(nullCopyMessage, e.getCause().getMessage());
-    try (NativeMap<V> closed = copy) {
-      closed.size();
-    }
+    copy.close();
     assertThrows(IllegalStateException.class, copy::size);
   }
 

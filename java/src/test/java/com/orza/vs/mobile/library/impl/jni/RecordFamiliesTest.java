@@ -3,6 +3,7 @@ package com.orza.vs.mobile.library.impl.jni;
 import static org.junit.jupiter.api.Assertions.*;
 
 import java.nio.ByteBuffer;
+import java.util.Collections;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
 
@@ -102,8 +103,7 @@ class RecordFamiliesTest {
     assertEquals(10, OrzaVSMobileJNI.ObjectInfo_contentType_get(ObjectInfo.getCPtr(qr), qr));
     qr.setContent("0123");
     qr.setProperties("{}");
-    VectorOfPoint2f outline = new VectorOfPoint2f();
-    outline.add(new Point2f(7, 8));
+    VectorOfPoint2f outline = new VectorOfPoint2f(Collections.singletonList(new Point2f(7, 8)));
     qr.setLocation(outline);
     outline.set(0, new Point2f(0, 0));
     assertEquals(7f, qr.getLocation().get(0).getX());
@@ -188,10 +188,8 @@ class RecordFamiliesTest {
     ByteArray body = new ByteArray();
     assertArrayEquals(new byte[0], new ByteArray(body).getData());
     assertNpe("OrzaVSMobile::ByteArray const & reference is null", () -> new ByteArray((ByteArray) null));
-    MapOfStringToString params = new MapOfStringToString();
-    params.put("p", "1");
-    MapOfStringToString metadata = new MapOfStringToString();
-    metadata.put("m", "2");
+    MapOfStringToString params = new MapOfStringToString(Collections.singletonMap("p", "1"));
+    MapOfStringToString metadata = new MapOfStringToString(Collections.singletonMap("m", "2"));
     ServerRequest full = new ServerRequest(body, "id-4", params, metadata);
     assertEquals("id-4", full.getId());
     assertEquals("1", full.getParams().get("p"));

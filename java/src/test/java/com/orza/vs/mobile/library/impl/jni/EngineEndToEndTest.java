@@ -112,9 +112,8 @@ class EngineEndToEndTest {
   @Test
   void framesGoOutAndResultsComeBackThroughJava() throws Exception {
     engine.startEngine();
-    String sent = streamUntilSent();
-    String[] parts = sent.split("\\|");
-    assertTrue(parts[0].startsWith("TovraStateEngine-"), sent);
+    String[] parts = streamUntilSent().split("\\|");
+    assertTrue(parts[0].startsWith("TovraStateEngine-"), parts[0]);
     assertEquals("true", parts[1], "the body is a JPEG");
     assertEquals("true", parts[2], "the request carries vsearch_params_json");
     assertNotEquals(Thread.currentThread().getName(), parts[3], "sent from the engine's worker");
@@ -148,8 +147,8 @@ class EngineEndToEndTest {
     transport.mode = TestTransport.Mode.THROUGH_HANDLER_AT_ONCE;
     streamUntilSent();
     assertTrue(nextEvent().contains("|q-1|true|"));
-    ServerResponseHandler none = new ServerResponseHandler(0, false);
-    assertThrows(NullPointerException.class, () -> none.handleServerResponse(new ServerResponse()));
+    assertThrows(NullPointerException.class,
+        () -> new ServerResponseHandler(0, false).handleServerResponse(new ServerResponse()));
   }
 
   @Test

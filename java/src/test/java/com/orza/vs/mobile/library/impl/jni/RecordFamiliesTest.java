@@ -107,8 +107,7 @@ class RecordFamiliesTest {
     qr.setLocation(outline);
     outline.set(0, new Point2f(0, 0));
     assertEquals(7f, qr.getLocation().get(0).getX());
-    // A value without a Java constant: swigToEnum refuses it, fromNative maps it to null, and
-    // a copy keeps it.
+    // A value without a Java constant: swigToEnum refuses it, fromNative gives null, a copy keeps it.
     OrzaVSMobileJNI.ObjectInfo_contentType_set(ObjectInfo.getCPtr(qr), qr, 42);
     assertThrows(IllegalArgumentException.class, qr::getContentType);
     assertNull(ContentType.fromNative(42));
@@ -222,9 +221,7 @@ class RecordFamiliesTest {
     assertEquals("kept", result.getResultStr());
     assertNpe("NEONAccelerationResult & reference is null", () -> MobileUtils.testNeon(null));
     assertNpe("null string", () -> MobileUtils.setupLogging(null));
-    for (int format = -1; format <= 7; format++) {
-      assertEquals(format >= 0 && format <= 2, OrzaVSMobile.isYUVFormat(format));
-    }
+    for (int f = -1; f <= 7; f++) assertEquals(f >= 0 && f <= 2, OrzaVSMobile.isYUVFormat(f), "format " + f);
     assertTrue(OrzaVSMobile.isYUVFormat(ImageFormat.NV12));
   }
 }

@@ -5,16 +5,12 @@ import static org.junit.jupiter.api.Assertions.*;
 import com.orza.vs.mobile.library.impl.jni.ContentType;
 import com.orza.vs.mobile.library.impl.jni.ImageBuffer;
 import com.orza.vs.mobile.library.impl.jni.ResponseStatus;
-import com.orza.vs.mobile.library.impl.jni.ServerDelegate;
-import com.orza.vs.mobile.library.impl.jni.ServerRequest;
-import com.orza.vs.mobile.library.impl.jni.ServerResponse;
+import com.orza.vs.mobile.library.impl.jni.TestTransport;
 import java.nio.ByteBuffer;
 import java.util.ArrayList;
 import java.util.Arrays;
 import java.util.List;
 import java.util.Random;
-import java.util.concurrent.LinkedBlockingQueue;
-import java.util.concurrent.TimeUnit;
 import org.junit.jupiter.api.AfterEach;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
@@ -23,52 +19,12 @@ import org.junit.jupiter.api.function.Executable;
 class VisualSearchSessionTest {
   static final int W = 64;
   static final int H = 48;
-  static final String REPLY = "{\"queryId\":\"q-1\",\"quillmark\":{\"searchResult\":["
-      + "{\"content\":\"shoe\",\"contentType\":\"PIDN\",\"properties\":{\"brand\":\"x\"},"
-      + "\"subContent\":[{\"content\":\"lace\",\"contentType\":\"SearchTerms\",\"properties\":{}}]},"
-      + "{\"content\":\"\",\"contentType\":\"BoundingBox\",\"properties\":{\"boundingBox\":"
-      + "{\"tlx\":10,\"tly\":20,\"trx\":110,\"try\":20,\"brx\":110,\"bry\":90,\"blx\":10,\"bly\":90}}}],"
-      + "\"resultMetadata\":{\"finalAccumulation\":true,\"accumulatedQueries\":[\"q-0\"]}}}";
-
-  /** Keeps each request (id, JPEG) until the test answers it. */
-  static final class Transport extends ServerDelegate {
-    final LinkedBlockingQueue<Object[]> requests = new LinkedBlockingQueue<Object[]>();
-
-    @Override
-    public boolean sendServerRequestImpl(ServerRequest request) {
-      return requests.add(new Object[] {request.getId(), request.getData().getData()});
-    }
-
-    byte[] answer(int code, String body) throws InterruptedException {
-      Object[] request = requests.poll(20, TimeUnit.SECONDS);
-      assertNotNull(request, "the engine sent a request");
-      ServerResponse response = new ServerResponse();
-      response.setId((String) request[0]);
-      response.setResponseCode(code);
-      response.setResponseStr(body);
-      pushServerResponse(response);
-      response.delete();
-      return (byte[]) request[1];
-    }
-  }
-
-  final Transport transport = new Transport();
+  final TestTransport transport = new TestTransport();
   final List<Object> heard = new ArrayList<Object>();
-  final SessionListener listener = new SessionListener() {
-    @Override
-    public void onInterestPoints(float[] xy) {
-      heard.add(xy);
-    }
-
-    @Override
-    public void onResults(SearchResults results) {
-      heard.add(results);
-    }
-
-    @Override
-    public void onServerError(ResponseStatus status, int code) {
-      heard.add(code);
-    }
+  final SessionListener listener = new SessionListener() {  // keeps all it hears, in order
+    @Override public void onInterestPoints(float[] xy) { heard.add(xy); }
+    @Override public void onResults(SearchResults results) { heard.add(results); }
+    @Override public void onServerError(ResponseStatus status, int code) { heard.add(code); }
   };
   final VisualSearchSession session = VisualSearchSession.builder().transport(transport).listener(listener).build();
   final byte[] y = new byte[W * H];
@@ -89,11 +45,8 @@ class VisualSearchSessionTest {
   }
 
   byte[] nv21() {
-    byte[] out = Arrays.copyOf(y, W * H * 3 / 2);
-    for (int i = 0; i < u.length; i++) {
-      out[W * H + 2 * i] = v[i];
-      out[W * H + 2 * i + 1] = u[i];
-    }
+    byte[] out = new byte[W * H * 3 / 2];
+    planes(LAYOUTS[0])[0].get(out);  // NV21 in one block
     return out;
   }
 
@@ -139,7 +92,7 @@ class VisualSearchSessionTest {
     session.pause();
     session.start();
     submit.execute();
-    return transport.answer(code, code == 200 ? REPLY : "busy");
+    return transport.answer(code, code == 200 ? TestTransport.REPLY : "busy");
   }
 
   @Test

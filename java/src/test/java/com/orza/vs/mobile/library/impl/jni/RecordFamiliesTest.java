@@ -1,24 +1,19 @@
 package com.orza.vs.mobile.library.impl.jni;
 
-import static org.junit.jupiter.api.Assertions.assertArrayEquals;
-import static org.junit.jupiter.api.Assertions.assertEquals;
-import static org.junit.jupiter.api.Assertions.assertFalse;
-import static org.junit.jupiter.api.Assertions.assertNull;
-import static org.junit.jupiter.api.Assertions.assertThrows;
-import static org.junit.jupiter.api.Assertions.assertTrue;
+import static org.junit.jupiter.api.Assertions.*;
 
 import java.nio.ByteBuffer;
+import java.util.Collections;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.function.Executable;
 
 class RecordFamiliesTest {
-  static void assertThrowsWithMessage(Class<? extends Throwable> type, String message,
-                                      Executable call) {
-    Throwable thrown = assertThrows(type, call);
-    assertEquals(message, thrown.getMessage());
+  static void assertThrowsWithMessage(Class<? extends Throwable> type, String message, Executable call) {
+    assertEquals(message, assertThrows(type, call).getMessage());
   }
 
-  static void assertNullReference(String message, Executable call) {
+  /** The call raises NullPointerException with exactly {@code message}. */
+  static void assertNpe(String message, Executable call) {
     assertThrowsWithMessage(NullPointerException.class, message, call);
   }
 
@@ -29,10 +24,10 @@ class RecordFamiliesTest {
     pair.setFirst("changed");
     assertEquals("a", copy.getFirst());
     assertEquals("", new StringPair().getSecond());
-    assertNullReference("std::pair< std::string,std::string > const & reference is null",
+    assertNpe("std::pair< std::string,std::string > const & reference is null",
         () -> new StringPair((StringPair) null));
-    assertNullReference("null string", () -> new StringPair(null, "x"));
-    assertNullReference("null string", () -> pair.setSecond(null));
+    assertNpe("null string", () -> new StringPair(null, "x"));
+    assertNpe("null string", () -> pair.setSecond(null));
     assertEquals("b", pair.getSecond());
     FrameID id = new FrameID();
     String text = "caf\u00e9 \u20ac \ud83d\ude00 a\u0000b";
@@ -56,26 +51,24 @@ class RecordFamiliesTest {
     focus.setX(99);
     assertEquals(1, extra.getFocusROI().getX());
     assertEquals(4, extra.getFocusROI().getHeight());
-    assertNullReference("OrzaVSMobile::FrameROI const & reference is null", () -> extra.setFocusROI(null));
+    assertNpe("OrzaVSMobile::FrameROI const & reference is null", () -> extra.setFocusROI(null));
     extra.setScreenOrient(270);
     extra.setFieldOfView(62.5);
     assertEquals(270, extra.getScreenOrient());
     assertEquals(62.5, extra.getFieldOfView());
     // A field view dies with its parent.
-    try (ExtraFrameData closing = extra) {
-      closing.setFlat(true);
-    }
-    Throwable late = assertThrows(IllegalStateException.class, display::getWidth);
-    assertEquals("FrameROI is part of another object that is no longer usable: "
-        + "ExtraFrameData has been deleted", late.getMessage());
+    extra.close();
+    assertThrowsWithMessage(IllegalStateException.class,
+        "FrameROI is part of another object that is no longer usable: ExtraFrameData has been deleted",
+        display::getWidth);
   }
 
   @Test
   void nullAndDeletedObjects() {
     OrzaVSMobileJNI.FrameROI_x_set(0, null, 5);  // a setter on null does nothing
     OrzaVSMobileJNI.FrameID_id_set(0, null, "ignored");
-    assertNullReference("OrzaVSMobile::FrameROI object is null", () -> OrzaVSMobileJNI.FrameROI_x_get(0, null));
-    assertNullReference("OrzaVSMobile::ImageBuffer object is null",
+    assertNpe("OrzaVSMobile::FrameROI object is null", () -> OrzaVSMobileJNI.FrameROI_x_get(0, null));
+    assertNpe("OrzaVSMobile::ImageBuffer object is null",
         () -> OrzaVSMobileJNI.ImageBuffer_fillBuffer(0, null, new byte[4], 4));
     // A deleted proxy is an exception, not a crash; freeing twice is harmless.
     FrameROI roi = new FrameROI();
@@ -110,13 +103,11 @@ class RecordFamiliesTest {
     assertEquals(10, OrzaVSMobileJNI.ObjectInfo_contentType_get(ObjectInfo.getCPtr(qr), qr));
     qr.setContent("0123");
     qr.setProperties("{}");
-    VectorOfPoint2f outline = new VectorOfPoint2f();
-    outline.add(new Point2f(7, 8));
+    VectorOfPoint2f outline = new VectorOfPoint2f(Collections.singletonList(new Point2f(7, 8)));
     qr.setLocation(outline);
     outline.set(0, new Point2f(0, 0));
     assertEquals(7f, qr.getLocation().get(0).getX());
-    // A value without a Java constant: swigToEnum refuses it, fromNative maps it to null, and
-    // a copy keeps it.
+    // A value without a Java constant: swigToEnum refuses it, fromNative gives null, a copy keeps it.
     OrzaVSMobileJNI.ObjectInfo_contentType_set(ObjectInfo.getCPtr(qr), qr, 42);
     assertThrows(IllegalArgumentException.class, qr::getContentType);
     assertNull(ContentType.fromNative(42));
@@ -126,7 +117,7 @@ class RecordFamiliesTest {
   }
 
   @Test
-  void imageBufferAllocationAndFills() {
+  void imageBufferFillsStayInsideMemoryTheBufferWasGiven() {
     ImageBuffer empty = new ImageBuffer();
     assertEquals(ImageFormat.NV21, empty.getFormat());
     assertEquals(0, empty.fillBuffer(new byte[10], 10));
@@ -154,10 +145,7 @@ class RecordFamiliesTest {
     assertEquals(0, buffer.getAllocLen());
     assertEquals(SWIGTYPE_p_unsigned_char.getCPtr(before), SWIGTYPE_p_unsigned_char.getCPtr(buffer.getData()));
     assertEquals(0, buffer.fillBuffer(source, 10));
-  }
 
-  @Test
-  void imageBufferDataAndAllocLenCannotOpenForeignMemory() {
     ImageBuffer owner = new ImageBuffer();
     owner.allocateBuffer(64);
     ImageBuffer other = new ImageBuffer();
@@ -198,11 +186,9 @@ class RecordFamiliesTest {
 
     ByteArray body = new ByteArray();
     assertArrayEquals(new byte[0], new ByteArray(body).getData());
-    assertNullReference("OrzaVSMobile::ByteArray const & reference is null", () -> new ByteArray((ByteArray) null));
-    MapOfStringToString params = new MapOfStringToString();
-    params.put("p", "1");
-    MapOfStringToString metadata = new MapOfStringToString();
-    metadata.put("m", "2");
+    assertNpe("OrzaVSMobile::ByteArray const & reference is null", () -> new ByteArray((ByteArray) null));
+    MapOfStringToString params = new MapOfStringToString(Collections.singletonMap("p", "1"));
+    MapOfStringToString metadata = new MapOfStringToString(Collections.singletonMap("m", "2"));
     ServerRequest full = new ServerRequest(body, "id-4", params, metadata);
     assertEquals("id-4", full.getId());
     assertEquals("1", full.getParams().get("p"));
@@ -210,10 +196,10 @@ class RecordFamiliesTest {
     assertNull(full.getResponseHandler());
     assertEquals(0, new ServerRequest(body, "id-3", params).getMetadata().size());
     assertEquals(0, new ServerRequest(body, "id-2").getData().getLength());
-    assertNullReference("Tovra::Server::ServerRequest::ParamMap const & reference is null",
+    assertNpe("Tovra::Server::ServerRequest::ParamMap const & reference is null",
         () -> new ServerRequest(body, "x", null));
-    assertNullReference("OrzaVSMobile::ByteArray const & reference is null", () -> new ServerRequest(null, "x"));
-    assertNullReference("null string", () -> new ServerRequest(body, null));
+    assertNpe("OrzaVSMobile::ByteArray const & reference is null", () -> new ServerRequest(null, "x"));
+    assertNpe("null string", () -> new ServerRequest(body, null));
     MapOfStringToString view = full.getParams();
     full.clear();
     assertEquals("", full.getId());
@@ -233,11 +219,9 @@ class RecordFamiliesTest {
     result.setResultStr("kept");
     MobileUtils.testNeon(result);
     assertEquals("kept", result.getResultStr());
-    assertNullReference("NEONAccelerationResult & reference is null", () -> MobileUtils.testNeon(null));
-    assertNullReference("null string", () -> MobileUtils.setupLogging(null));
-    for (int format = -1; format <= 7; format++) {
-      assertEquals(format >= 0 && format <= 2, OrzaVSMobile.isYUVFormat(format));
-    }
+    assertNpe("NEONAccelerationResult & reference is null", () -> MobileUtils.testNeon(null));
+    assertNpe("null string", () -> MobileUtils.setupLogging(null));
+    for (int f = -1; f <= 7; f++) assertEquals(f >= 0 && f <= 2, OrzaVSMobile.isYUVFormat(f), "format " + f);
     assertTrue(OrzaVSMobile.isYUVFormat(ImageFormat.NV12));
   }
 }

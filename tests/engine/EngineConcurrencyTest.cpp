@@ -17,8 +17,8 @@
 #include <gtest/gtest.h>
 
 #include "engine/FrameRecordManager.h"
+#include "support/DiagnosticsRecorder.h"
 #include "support/Fakes.h"
-#include "support/StdoutCapture.h"
 
 namespace {
 
@@ -79,7 +79,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   const auto start = Clock::now();
   auto now = [start] { return std::chrono::duration<double>(Clock::now() - start).count(); };
   std::atomic<bool> stop{false};
-  StdoutCapture printed;  // lines about frames skipped while not running
+  DiagnosticsRecorder diagnostics;  // lines about frames skipped while not running
   std::vector<std::thread> threads;
   for (int c = 0; c < 3; ++c) {
     threads.emplace_back([&, c] {

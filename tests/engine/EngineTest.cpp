@@ -14,9 +14,9 @@
 
 #include <gtest/gtest.h>
 
+#include "support/DiagnosticsRecorder.h"
 #include "support/Fakes.h"
 #include "support/GuardedBytes.h"
-#include "support/StdoutCapture.h"
 
 namespace {
 
@@ -111,14 +111,14 @@ TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
   // The lent buffer outlived the reset that dropped its record: a late fill is harmless.
   EXPECT_EQ(lent.fillBuffer(textured.data(), kW * kH), kW * kH);
   // Paused: the defined lines, nothing lent, nothing processed.
-  orzavs_test::StdoutCapture printed;
+  orzavs_test::DiagnosticsRecorder diagnostics;
   ImageBuffer refused = geometry(OrzaVSMobile::GRAY), plain = image();
   std::string refusedKey = "kept";
   engine->requestImageBuffer(refused, refusedKey);
   ExtraFrameData extra;
   engine->process(refusedKey, plain, extra);
   engine->processSingleImage(plain, extra);
-  EXPECT_EQ(printed.text(),
+  EXPECT_EQ(diagnostics.text(),
             "Failed to request image buffer: TSE not in RUNNING state\n"
             "Skipped input frame: TSE not in RUNNING state\n"
             "Skipped input frame: TSE not in RUNNING state\n");
@@ -138,7 +138,7 @@ TEST(EngineFacade, ANullEventDelegateMeansNoCallbacks) {
   std::vector<uint8_t> pixels = orzavs_test::makeFrame(kW, kH, kW, OrzaVSMobile::GRAY);
   ImageBuffer image(0, OrzaVSMobile::GRAY, kW, kH, kW, 1, pixels.data());
   ExtraFrameData extra;
-  orzavs_test::StdoutCapture printed;
+  orzavs_test::DiagnosticsRecorder diagnostics;
   facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport, "props are ignored");
   facade.startEngine();
   facade.processSingleImage(image, extra);
@@ -155,7 +155,7 @@ TEST(EngineFacade, ANullEventDelegateMeansNoCallbacks) {
   Tovra::CameraResRequirement requirement;
   facade.getCameraResRequirement(requirement);
   EXPECT_EQ(std::make_pair(requirement.minHeight, requirement.maxHeight), std::make_pair(320, 720));
-  EXPECT_EQ(printed.text(), "");
+  EXPECT_EQ(diagnostics.text(), "");
 }
 
 TEST_F(EngineTest, TimeRuleComparesDoubleDifferencesStrictly) {
@@ -234,7 +234,7 @@ TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
   EXPECT_EQ(frameIdOf(transport.sent()[0].id), "0");  // the lent record itself was sent
   ASSERT_TRUE(jobIdle());
 
-  orzavs_test::StdoutCapture printed;
+  orzavs_test::DiagnosticsRecorder diagnostics;
   ImageBuffer plain = image();
   engine->process("no-such-key", plain, extra);  // like an empty key: no line
   std::vector<ImageBuffer> buffers(6, geometry(OrzaVSMobile::GRAY));
@@ -252,7 +252,7 @@ TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
     engine->process(keys[i], buffers[i], extra);
     EXPECT_EQ(buffers[i].data, nullptr) << i;
   }
-  EXPECT_EQ(printed.text(),
+  EXPECT_EQ(diagnostics.text(),
             "Failed to get a new frame record slot in getRequestImageBuffers\n"
             "Failed to process non-GRAY/YUV format in continuous scanning mode\n"
             "Skipped input frame: row stride 63 is smaller than a row of 64 bytes\n"
@@ -282,9 +282,9 @@ TEST_F(EngineTest, BadFramesPrintOneLineAndLeaveTheEngineWorking) {
       {unsupported, bad(-1, kW, kH, kW)}, {unsupported, bad(8, kW, kH, kW)}};
   ExtraFrameData extra;
   for (auto c : cases) {
-    orzavs_test::StdoutCapture printed;
+    orzavs_test::DiagnosticsRecorder diagnostics;
     engine->process("", c.image, extra);
-    EXPECT_EQ(printed.text(), c.line);
+    EXPECT_EQ(diagnostics.text(), c.line);
   }
   EXPECT_TRUE(events.pointCounts().empty());
   EXPECT_EQ(engine->lastTakenTime(), -1.0);
@@ -308,11 +308,11 @@ TEST_F(EngineTest, SingleImageReturnsOnlyAfterTheReplyWasHandled) {
     r.responseCode = 500;
     return true;
   });
-  orzavs_test::StdoutCapture printed;
+  orzavs_test::DiagnosticsRecorder diagnostics;
   engine->processSingleImage(image, extra);
   ImageBuffer narrow(0, OrzaVSMobile::BGR, kW, kH, kW * 2, 3, bgr.data());
   engine->processSingleImage(narrow, extra);
-  EXPECT_EQ(printed.text(),
+  EXPECT_EQ(diagnostics.text(),
             "VSS SERVER ERROR: response: \n"
             "Skipped input frame: row stride 128 is smaller than a row of 192 bytes\n");
   ASSERT_EQ(events.errors().size(), 1u);
@@ -347,9 +347,9 @@ TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIdsAndRestartsUpTo
   held.clear();
   again.reset();
   {
-    orzavs_test::StdoutCapture out;
+    orzavs_test::DiagnosticsRecorder diagnostics;
     EXPECT_FALSE(pool.restart());
-    EXPECT_EQ("Unable to restart frame record manager () as some frame(s) are still outstanding\n", out.text());
+    EXPECT_EQ("Unable to restart frame record manager () as some frame(s) are still outstanding\n", diagnostics.text());
   }
   EXPECT_TRUE(firstOld.expired());  // slot 1 renewed; the slots after the held one are kept
   std::shared_ptr<FrameRecord> renewed = pool.getNewSlot();
@@ -358,9 +358,9 @@ TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIdsAndRestartsUpTo
 
   second.reset();
   renewed.reset();
-  orzavs_test::StdoutCapture out;
+  orzavs_test::DiagnosticsRecorder diagnostics;
   EXPECT_TRUE(pool.restart());  // everything free: renewed and renumbered
-  EXPECT_EQ("", out.text());
+  EXPECT_EQ("", diagnostics.text());
   takeAll(pool, held, 0);
 }
 

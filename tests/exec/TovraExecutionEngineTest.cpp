@@ -7,7 +7,7 @@
 #include <thread>
 #include <vector>
 
-#include "support/StdoutCapture.h"
+#include "support/DiagnosticsRecorder.h"
 #include "support/TestJob.h"
 
 using namespace orzavs_test;
@@ -22,7 +22,7 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
   jobs[0]->work = [&](TestJob&) { gate.wait(); };
   jobs[5]->endAwaitingReply = true;
   {
-    StdoutCapture out;
+    DiagnosticsRecorder diagnostics;
     TovraExecutionEngine engine(1);
     jobs[19]->work = [&](TestJob&) { engine.addJob(&added); };  // a job adding a job
     engine.addJob(nullptr);  // ignored silently
@@ -30,7 +30,7 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
     EXPECT_EQ(Tovra::Queued, jobs[1]->state());
     gate.open();
     ASSERT_TRUE(added.waitForState(Tovra::Finished));
-    EXPECT_EQ("", out.text());
+    EXPECT_EQ("", diagnostics.text());
   }
   std::vector<int> expected(21);
   std::iota(expected.begin(), expected.end(), 0);
@@ -43,9 +43,9 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
 TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
   TestJob job(1);
   {
-    StdoutCapture out;
+    DiagnosticsRecorder diagnostics;
     TovraExecutionEngine engine(0);
-    EXPECT_EQ("Initialized TovraExecutionEngine with invalid number of threads\n", out.text());
+    EXPECT_EQ("Initialized TovraExecutionEngine with invalid number of threads\n", diagnostics.text());
     engine.addJob(&job);
     std::this_thread::sleep_for(Ms(20));
   }
@@ -64,9 +64,9 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   engine.cancelJobs();
   TestJob refused(4);
   {
-    StdoutCapture out;
+    DiagnosticsRecorder diagnostics;
     engine.addJob(&refused);
-    EXPECT_EQ("", out.text());  // refused before it was marked: no message, still Idle
+    EXPECT_EQ("", diagnostics.text());  // refused before it was marked: no message, still Idle
   }
   EXPECT_EQ(Tovra::Idle, refused.state());
   release.open();
@@ -85,9 +85,9 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   // refusal and settles the job.
   TestJob racing(6);
   racing.onMarkQueued = [&](TestJob&) { engine.cancelJobs(); };
-  StdoutCapture out;
+  DiagnosticsRecorder diagnostics;
   engine.addJob(&racing);
-  EXPECT_EQ("Error: Adding job to stopped/canceled execution engine\n", out.text());
+  EXPECT_EQ("Error: Adding job to stopped/canceled execution engine\n", diagnostics.text());
   EXPECT_EQ(outcome(Tovra::Finished, 0), racing.outcome());
 }
 

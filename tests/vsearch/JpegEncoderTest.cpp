@@ -8,7 +8,7 @@
 #include <tuple>
 #include <vector>
 
-#include "support/StdoutCapture.h"
+#include "support/DiagnosticsRecorder.h"
 #include "tests/vsearch/JpegTestSupport.h"
 
 namespace {
@@ -191,7 +191,7 @@ TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAr
 
   // Sizes the library refuses raise its fatal error: false with its message, nothing thrown,
   // printed or leaked, and the next call works.
-  orzavs_test::StdoutCapture capture;
+  orzavs_test::DiagnosticsRecorder diagnostics;
   const std::vector<uint8_t> wide(70000 * 2 * 3 / 2, 0x80);  // 70000 x 2 in any layout
   const std::string tooBig = "Maximum supported image dimension is 65500 pixels";
   for (ImageFormat format : kYuvFormats) {
@@ -205,7 +205,7 @@ TEST(JpegEncoder, UnusableArgumentsAndLibraryErrorsGiveFalseAndOverlappingRowsAr
   EXPECT_EQ(reason, tooBig);
   EXPECT_FALSE(encodePackedToJpeg(wide.data(), 1, 8, 0, 2, BGR, out, 50, work, &reason));
   EXPECT_EQ(reason, "invalid channel count or stride");
-  EXPECT_EQ(capture.text(), "");
+  EXPECT_EQ(diagnostics.text(), "");
   EXPECT_TRUE(decodeJpeg(yuvJpeg(packYuv(makeYuv(32, 32), NV21), 32, 32, NV21)).ok);
 }
 

@@ -16,8 +16,8 @@
 
 #include <gtest/gtest.h>
 
+#include "support/DiagnosticsRecorder.h"
 #include "support/Fakes.h"
-#include "support/StdoutCapture.h"
 #include "vsearch/JpegEncoder.h"
 #include "vsearch/JpegTestSupport.h"
 
@@ -269,13 +269,13 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
   shortYuv->pixels.resize(32 * 32);
   auto shortPacked = makeRecord(32, 32, OrzaVSMobile::BGRA);
   shortPacked->numChannels = 4;
-  StdoutCapture printed;
+  DiagnosticsRecorder diagnostics;
   for (const auto& bad : {shortYuv, shortPacked}) {
     job->setFrameRecord(bad);
     job->run();
     EXPECT_EQ(job->state(), Tovra::Finished);
   }
-  EXPECT_EQ(printed.text(),
+  EXPECT_EQ(diagnostics.text(),
             "Skipped frame 7: its pixels do not cover a 32x32 image\n"
             "Skipped frame 7: its pixels do not cover a 32x32 image\n");
   EXPECT_EQ(transport.sentCount(), 0u);
@@ -286,13 +286,13 @@ TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
       {404, "not found", Tovra::Server::RESPONSE_SERVER_ERROR},
       {200, "{\"queryId\":", Tovra::Server::RESPONSE_PARSE_ERROR},
       {201, "{}", Tovra::Server::RESPONSE_SERVER_ERROR}};  // only 200 is success
-  StdoutCapture printed;
+  DiagnosticsRecorder diagnostics;
   std::string lines;
   for (const auto& f : failures) {
     transport.pushServerResponse(makeResponse(sendGray(), f.body, f.code));
     lines += std::string("VSS SERVER ERROR: response: ") + f.body + "\n";
   }
-  EXPECT_EQ(printed.text(), lines);
+  EXPECT_EQ(diagnostics.text(), lines);
   const std::vector<ErrorCall> errors = events.errors();
   ASSERT_EQ(errors.size(), 3u);
   for (size_t i = 0; i < 3; ++i) {

@@ -11,7 +11,6 @@
 #include <set>
 #include <string>
 #include <thread>
-#include <tuple>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -25,30 +24,13 @@ namespace {
 using namespace orzavs_test;
 using OrzaVSMobile::ImageBuffer;
 
-// Counts callbacks; each 200 reply carries a unique token as its query id. Interest points are
-// counted without a lock, so that the delegate orders nothing between the engine's threads.
-struct CountingEvents : Tovra::EventDelegateBase {
-  void didDecode(const std::vector<Tovra::ObjectInfo>&, const Tovra::ResultMetadata& m) override {
-    std::lock_guard<std::mutex> lock(mutex);
-    duplicates += tokens.insert(m.queryID).second ? 0 : 1;
-    ++decodes;
-  }
-  void didReceiveServerError(Tovra::ObjectModuleID, Tovra::Server::ResponseStatus status, int32_t code) override {
-    std::lock_guard<std::mutex> lock(mutex);
-    unexpected += status == Tovra::Server::RESPONSE_SERVER_ERROR && code == 503 ? 0 : 1;
-    ++errors;
-  }
+// Records replies; interest points are only counted, without a lock, so that the delegate orders
+// nothing between the engine's threads.
+struct CountingEvents : RecordingEvents {
   void didDetectInterestPoints(const std::vector<OrzaVSMobile::Point2f>& points) override {
     tooManyPoints += points.size() > 50 ? 1 : 0;
     ++frames;
   }
-  size_t callbacks() {
-    std::lock_guard<std::mutex> lock(mutex);
-    return decodes + errors;
-  }
-  std::mutex mutex;
-  std::set<std::string> tokens;
-  size_t decodes = 0, errors = 0, duplicates = 0, unexpected = 0;
   std::atomic<size_t> frames{0}, tooManyPoints{0};
 };
 
@@ -123,13 +105,20 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
 
   EXPECT_TRUE(transport.sentCount() > 0 && events.frames.load() > 0);
   EXPECT_EQ(transport.pushedCount() + transport.droppedCount(), transport.sentCount());
+  // Each 200 reply carried a unique token as its query id, every other reply was a 503.
+  const std::vector<Tovra::ResultMetadata> decoded = events.metadata();
+  const std::vector<ErrorCall> errors = events.errors();
+  std::set<std::string> tokens;
+  for (const Tovra::ResultMetadata& m : decoded) tokens.insert(m.queryID);
+  EXPECT_EQ(tokens.size(), decoded.size()) << "a reply was reported twice";
+  for (const ErrorCall& e : errors) {
+    EXPECT_TRUE(e.status == Tovra::Server::RESPONSE_SERVER_ERROR && e.code == 503) << e.status << " " << e.code;
+  }
+  EXPECT_EQ(events.tooManyPoints.load(), 0u);
   {
     std::lock_guard<std::mutex> lock(responderMutex);
-    std::lock_guard<std::mutex> lock2(events.mutex);
-    EXPECT_LE(events.decodes, static_cast<size_t>(answered200));
-    EXPECT_LE(events.errors, static_cast<size_t>(answered503));
-    EXPECT_EQ(std::make_tuple(events.duplicates, events.unexpected, events.tooManyPoints.load()),
-              std::make_tuple(size_t{0}, size_t{0}, size_t{0}));
+    EXPECT_LE(decoded.size(), static_cast<size_t>(answered200));
+    EXPECT_LE(errors.size(), static_cast<size_t>(answered503));
     alwaysAnswer = true;
   }
 
@@ -137,7 +126,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   engine->stopEngine();
   engine->startEngine();
   const size_t sentBefore = transport.sentCount();
-  const size_t callbacksBefore = events.callbacks();
+  const size_t callbacksBefore = events.replyCallbacks();
   std::vector<uint8_t> pixels = makeFrame(48, 32, 48, OrzaVSMobile::GRAY);
   ImageBuffer image(0, OrzaVSMobile::GRAY, 48, 32, 48, 1, pixels.data());
   OrzaVSMobile::ExtraFrameData extra;
@@ -146,12 +135,12 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
     ASSERT_TRUE(waitFor([&] {
       extra.timeStamp += 1.0;
       engine->process("", image, extra);
-      return events.callbacks() >= callbacksBefore + round;
+      return events.replyCallbacks() >= callbacksBefore + round;
     }, Ms(10000)));
   }
   // The last frame may have dispatched one more request: wait until the job is idle again.
   ASSERT_TRUE(waitFor([&] { return !engine->job(0).isBusy() && transport.idle(); }, Ms(10000)));
-  EXPECT_EQ(transport.sentCount() - sentBefore, events.callbacks() - callbacksBefore);
+  EXPECT_EQ(transport.sentCount() - sentBefore, events.replyCallbacks() - callbacksBefore);
 
   // Gone while a reply may still be on its way.
   extra.timeStamp += 1.0;

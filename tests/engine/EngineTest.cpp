@@ -44,13 +44,7 @@ std::vector<uint8_t> pattern(size_t n) {
 std::string frameIdOf(const std::string& requestId) { return requestId.substr(requestId.rfind('-') + 1); }
 
 // A started engine on NV21 frames whose transport answers nothing unless told to.
-class EngineTest : public ::testing::Test, public orzavs_test::EngineRig {
- protected:
-  // Whether a frame is held, how many buffers are lent, the last time stamp taken.
-  std::tuple<bool, size_t, double> bookkeeping() const {
-    return std::make_tuple(engine->hasHeldRecord(), engine->pendingBufferCount(), engine->lastTakenTime());
-  }
-};
+class EngineTest : public ::testing::Test, public orzavs_test::EngineRig {};
 
 TEST(EngineLifecycle, FollowsTheStateTable) {
   using E = TovraStateEngine;
@@ -104,9 +98,12 @@ TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
   ImageBuffer lent = geometry(OrzaVSMobile::GRAY);
   std::string key;
   engine->requestImageBuffer(lent, key);
-  EXPECT_EQ(bookkeeping(), std::make_tuple(true, 1u, 2.0));
+  // Whether a frame is held, how many buffers are lent, the last time stamp taken.
+  EXPECT_EQ(std::make_tuple(engine->hasHeldRecord(), engine->pendingBufferCount(), engine->lastTakenTime()),
+            std::make_tuple(true, size_t{1}, 2.0));
   engine->pauseEngine();
-  EXPECT_EQ(bookkeeping(), std::make_tuple(false, 0u, -1.0));
+  EXPECT_EQ(std::make_tuple(engine->hasHeldRecord(), engine->pendingBufferCount(), engine->lastTakenTime()),
+            std::make_tuple(false, size_t{0}, -1.0));
   EXPECT_EQ(engine->job(0).state(), Tovra::Finished);
   // The lent buffer outlived the reset that dropped its record: a late fill is harmless.
   EXPECT_EQ(lent.fillBuffer(textured.data(), kW * kH), kW * kH);

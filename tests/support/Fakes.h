@@ -230,26 +230,19 @@ inline Tovra::Server::ServerRequest makeRequest(const std::string& id, Tovra::Se
 
 inline Tovra::Server::ServerResponse makeResponse(const std::string& id, const std::string& body = "",
                                                   int32_t code = 200, double roundtripTime = -1.0) {
-  Tovra::Server::ServerResponse response;
-  response.id = id;
-  response.responseStr = body;
-  response.responseCode = code;
-  response.roundtripTime = roundtripTime;
-  return response;
+  return Tovra::Server::ServerResponse{false, code, id, body, roundtripTime};
 }
 
-// A started engine wired to a recording delegate and transport, fed 64x48 frames of `format`:
-// textured, or uniform with `flat`.
+// A started engine wired to a recording delegate and transport, fed 64x48 NV21 frames: textured,
+// or uniform with `isFlat`.
 struct EngineRig {
-  explicit EngineRig(OrzaVSMobile::ImageFormat frameFormat = OrzaVSMobile::NV21)
-      : format(frameFormat), textured(makeFrame(64, 48, 64, format)), flat(makeFrame(64, 48, 64, format, true)),
-        engine(new Tovra::TovraStateEngine) {
+  EngineRig() {
     engine->setEventDelegate(&events);
     engine->addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
     engine->startEngine();
   }
   OrzaVSMobile::ImageBuffer image(bool isFlat = false) {
-    return OrzaVSMobile::ImageBuffer(0, format, 64, 48, 64, 1, (isFlat ? flat : textured).data());
+    return OrzaVSMobile::ImageBuffer(0, OrzaVSMobile::NV21, 64, 48, 64, 1, (isFlat ? flat : textured).data());
   }
   void frame(double t, bool isFlat = false) {
     OrzaVSMobile::ImageBuffer pixels = image(isFlat);
@@ -272,9 +265,9 @@ struct EngineRig {
 
   RecordingEvents events;
   FakeTransport transport;
-  const OrzaVSMobile::ImageFormat format;
-  std::vector<uint8_t> textured, flat;
-  std::unique_ptr<Tovra::TovraStateEngine> engine;  // last: destroyed before its delegates
+  std::vector<uint8_t> textured = makeFrame(64, 48, 64, OrzaVSMobile::NV21);
+  std::vector<uint8_t> flat = makeFrame(64, 48, 64, OrzaVSMobile::NV21, true);
+  std::unique_ptr<Tovra::TovraStateEngine> engine{new Tovra::TovraStateEngine};  // last: destroyed before its delegates
 };
 
 }  // namespace orzavs_test

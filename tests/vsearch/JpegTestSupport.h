@@ -151,25 +151,22 @@ inline Decoded decodeJpeg(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space 
   return d;
 }
 
-// PSNR in dB of n samples a[i * aStep] against b[i * bStep] (infinite when equal).
-inline double psnr(const uint8_t* a, size_t aStep, const uint8_t* b, size_t bStep, size_t n) {
+// PSNR in dB of n samples of `a` against `b` (infinite when equal).
+inline double psnr(const uint8_t* a, const uint8_t* b, size_t n) {
   double sum = 0;
-  for (size_t i = 0; i < n; ++i) sum += std::pow(double(a[i * aStep]) - double(b[i * bStep]), 2);
+  for (size_t i = 0; i < n; ++i) sum += std::pow(double(a[i]) - double(b[i]), 2);
   return sum == 0 ? INFINITY : 10.0 * std::log10(255.0 * 255.0 * static_cast<double>(n) / sum);
 }
 
-// Luminance PSNR of a YCbCr decode against its source.
-inline double lumaPsnr(const Decoded& d, const Yuv420& img) {
-  return psnr(d.pixels.data(), 3, img.y.data(), 1, img.y.size());
-}
-
-// PSNR of chroma plane 1 (Cb) or 2 (Cr) over the source's samples: with replicated chroma the
-// decoded sample at (2x, 2y) is chroma sample (x, y).
-inline double chromaPsnr(const Decoded& d, const Yuv420& img, int plane) {
+// PSNR of component 0 (Y), 1 (Cb) or 2 (Cr) of a YCbCr decode against the source's plane: with
+// replicated chroma the decoded sample at (2x, 2y) is chroma sample (x, y).
+inline double planePsnr(const Decoded& d, const Yuv420& img, int plane) {
+  const int scale = plane == 0 ? 1 : 2;
+  const std::vector<uint8_t>& source = plane == 0 ? img.y : plane == 1 ? img.u : img.v;
   std::vector<uint8_t> decoded;
-  for (int y = 0; y < img.ch(); ++y)
-    for (int x = 0; x < img.cw(); ++x) decoded.push_back(d.pixels[(2 * y * d.width + 2 * x) * 3 + plane]);
-  return psnr(decoded.data(), 1, (plane == 1 ? img.u : img.v).data(), 1, decoded.size());
+  for (int y = 0; y < img.height / scale; ++y)
+    for (int x = 0; x < img.width / scale; ++x) decoded.push_back(d.pixels[scale * (y * d.width + x) * 3 + plane]);
+  return psnr(decoded.data(), source.data(), decoded.size());
 }
 
 }  // namespace jpeg_test

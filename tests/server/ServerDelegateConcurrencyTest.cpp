@@ -10,7 +10,6 @@
 #include <vector>
 
 #include "support/Fakes.h"
-#include "support/TestJob.h"
 
 using namespace orzavs_test;
 using Tovra::Server::ServerResponse;

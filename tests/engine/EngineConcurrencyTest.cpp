@@ -103,8 +103,8 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   for (auto& t : threads) t.join();
   ASSERT_TRUE(waitFor([&] { return transport.idle(); }));
 
-  EXPECT_TRUE(transport.sentCount() > 0 && events.frames.load() > 0);
-  EXPECT_EQ(transport.pushedCount() + transport.droppedCount(), transport.sentCount());
+  EXPECT_TRUE(transport.sent().size() > 0 && events.frames.load() > 0);
+  EXPECT_EQ(transport.pushedCount() + transport.droppedCount(), transport.sent().size());
   // Each 200 reply carried a unique token as its query id, every other reply was a 503.
   const std::vector<Tovra::ResultMetadata> decoded = events.metadata();
   const std::vector<ErrorCall> errors = events.errors();
@@ -125,7 +125,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   // Calm: a fresh start and a transport that always answers.
   engine->stopEngine();
   engine->startEngine();
-  const size_t sentBefore = transport.sentCount();
+  const size_t sentBefore = transport.sent().size();
   const size_t callbacksBefore = events.replyCallbacks();
   std::vector<uint8_t> pixels = makeFrame(48, 32, 48, OrzaVSMobile::GRAY);
   ImageBuffer image(0, OrzaVSMobile::GRAY, 48, 32, 48, 1, pixels.data());
@@ -140,7 +140,7 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   }
   // The last frame may have dispatched one more request: wait until the job is idle again.
   ASSERT_TRUE(waitFor([&] { return !engine->job(0).isBusy() && transport.idle(); }, Ms(10000)));
-  EXPECT_EQ(transport.sentCount() - sentBefore, events.replyCallbacks() - callbacksBefore);
+  EXPECT_EQ(transport.sent().size() - sentBefore, events.replyCallbacks() - callbacksBefore);
 
   // Gone while a reply may still be on its way.
   extra.timeStamp += 1.0;
@@ -188,10 +188,9 @@ TEST(FrameRecordManagerStress, RecordsReleasedOnOtherThreadsAreReusedSafely) {
   Tovra::FrameRecordManager pool(5);
   std::mutex queueMutex;
   std::vector<std::shared_ptr<Tovra::FrameRecord>> handedOver;
-  std::atomic<int> producing{2}, consumed{0}, mismatches{0};
+  std::atomic<int> consumed{0}, mismatches{0};
   auto consumer = [&] {
-    for (;;) {
-      const bool last = producing.load() == 0;  // read first: then an empty queue stays empty
+    while (consumed.load() < 2 * kFramesEach) {
       std::shared_ptr<Tovra::FrameRecord> record;
       {
         std::lock_guard<std::mutex> lock(queueMutex);
@@ -201,7 +200,6 @@ TEST(FrameRecordManagerStress, RecordsReleasedOnOtherThreadsAreReusedSafely) {
         }
       }
       if (!record) {
-        if (last) return;
         std::this_thread::yield();
         continue;
       }
@@ -226,7 +224,6 @@ TEST(FrameRecordManagerStress, RecordsReleasedOnOtherThreadsAreReusedSafely) {
       std::lock_guard<std::mutex> lock(queueMutex);
       handedOver.push_back(std::move(record));
     }
-    --producing;
   };
   std::thread threads[] = {std::thread(consumer), std::thread(consumer), std::thread(producer, std::ref(ids[0])),
                            std::thread(producer, std::ref(ids[1]))};
@@ -236,7 +233,6 @@ TEST(FrameRecordManagerStress, RecordsReleasedOnOtherThreadsAreReusedSafely) {
   all.insert(ids[1].begin(), ids[1].end());
   EXPECT_EQ(2u * kFramesEach, all.size()) << "a frame id was handed out twice";
   EXPECT_EQ(2u * kFramesEach - 1, *all.rbegin());
-  EXPECT_EQ(2 * kFramesEach, consumed.load());
   EXPECT_EQ(0, mismatches.load());
   EXPECT_TRUE(pool.restart());
 }

@@ -123,7 +123,7 @@ TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
   engine->resumeEngine();
   frame(2.0);  // the same time stamp is taken again after the reset
   EXPECT_EQ(engine->lastTakenTime(), 2.0);
-  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 2; }));
+  ASSERT_TRUE(waitFor([&] { return transport.sent().size() == 2; }));
 }
 
 // Without an event delegate replies are still handled, silently; the metrics this build does not
@@ -164,11 +164,11 @@ TEST_F(EngineTest, TimeRuleComparesDoubleDifferencesStrictly) {
     engine->resumeEngine();
     frame(c.last);
     ASSERT_TRUE(jobIdle());
-    const size_t sent = transport.sentCount();
+    const size_t sent = transport.sent().size();
     frame(c.next);
     EXPECT_EQ(engine->lastTakenTime(), c.taken ? c.next : c.last) << c.last << " -> " << c.next;
     ASSERT_TRUE(jobIdle());
-    EXPECT_EQ(transport.sentCount(), sent + (c.taken ? 1 : 0));
+    EXPECT_EQ(transport.sent().size(), sent + (c.taken ? 1 : 0));
   }
   EXPECT_EQ(events.pointCounts().size(), 8u);  // every accepted frame, taken or not
   EXPECT_TRUE(events.pointCounts()[0] > 0 && events.pointCounts()[0] <= 50) << events.pointCounts()[0];
@@ -189,7 +189,7 @@ TEST_F(EngineTest, HeldFrameIsReplacedBySharpnessOrAgeAndSentWhenTheJobFrees) {
   ASSERT_TRUE(jobIdle());
   frame(0.76, true);  // not taken itself, but dispatches the held frame
   EXPECT_FALSE(engine->hasHeldRecord());
-  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 2; }));
+  ASSERT_TRUE(waitFor([&] { return transport.sent().size() == 2; }));
   EXPECT_EQ(frameIdOf(transport.sent()[0].id) + "," + frameIdOf(transport.sent()[1].id), "0,3");
   EXPECT_EQ(transport.sent()[1].metadata.at("lastQueryId"), "Q0");
 }
@@ -227,7 +227,7 @@ TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
   extra.timeStamp = 0.0;
   engine->process(key, lent, extra);
   EXPECT_TRUE(lent.data == nullptr && lent.allocLen == 0);  // detached from the record it handed back
-  ASSERT_TRUE(waitFor([&] { return transport.sentCount() == 1; }));
+  ASSERT_TRUE(waitFor([&] { return transport.sent().size() == 1; }));
   EXPECT_EQ(frameIdOf(transport.sent()[0].id), "0");  // the lent record itself was sent
   ASSERT_TRUE(jobIdle());
 

@@ -138,7 +138,6 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   }
 
   std::vector<SentRequest> sent() const { return locked([this] { return sent_; }); }
-  size_t sentCount() const { return locked([this] { return sent_.size(); }); }
   size_t pushedCount() const { return locked([this] { return pushed_; }); }
   size_t droppedCount() const { return locked([this] { return dropped_; }); }
   bool idle() const { return locked([this] { return queue_.empty() && !pushing_; }); }  // all pushed
@@ -213,7 +212,6 @@ class RecordingHandler : public Tovra::Server::ServerResponseHandler {
     std::lock_guard<std::mutex> lock(mutex_);
     return responses_;
   }
-  size_t count() const { return responses().size(); }
   std::function<void(const Tovra::Server::ServerResponse&)> onResponse;
 
  private:
@@ -255,10 +253,10 @@ struct EngineRig {
   // (for a transport that does not answer at once).
   std::string send(double t) {
     EXPECT_TRUE(jobIdle());
-    const size_t before = transport.sentCount();
+    const size_t before = transport.sent().size();
     frame(t);
     EXPECT_TRUE(waitFor([&] {
-      return transport.sentCount() == before + 1 && engine->job(0).state() == Tovra::AwaitingReply;
+      return transport.sent().size() == before + 1 && engine->job(0).state() == Tovra::AwaitingReply;
     }));
     return transport.sent().back().id;
   }

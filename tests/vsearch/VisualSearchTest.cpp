@@ -221,10 +221,10 @@ class JobTest : public ::testing::Test {
   }
   // Runs the job on one frame; returns the id of the request it sent.
   std::string send(const std::shared_ptr<FrameRecord>& record) {
-    const size_t before = transport.sentCount();
+    const size_t before = transport.sent().size();
     job->setFrameRecord(record);
     job->run();
-    EXPECT_EQ(transport.sentCount(), before + 1);
+    EXPECT_EQ(transport.sent().size(), before + 1);
     EXPECT_EQ(job->state(), Tovra::AwaitingReply);
     return transport.sent().back().id;
   }
@@ -278,7 +278,7 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
   EXPECT_EQ(diagnostics.text(),
             "Skipped frame 7: its pixels do not cover a 32x32 image\n"
             "Skipped frame 7: its pixels do not cover a 32x32 image\n");
-  EXPECT_EQ(transport.sentCount(), 0u);
+  EXPECT_EQ(transport.sent().size(), 0u);
 }
 
 TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {

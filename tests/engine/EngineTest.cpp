@@ -20,9 +20,8 @@
 
 namespace {
 
+using namespace OrzaVSMobile;
 using orzavs_test::waitFor;
-using OrzaVSMobile::ExtraFrameData;
-using OrzaVSMobile::ImageBuffer;
 using Tovra::FrameRecord;
 using Tovra::FrameRecordManager;
 using Tovra::TovraStateEngine;
@@ -31,7 +30,7 @@ constexpr int kW = 64;
 constexpr int kH = 48;
 
 // A buffer without pixels, as the client hands it in to be lent memory.
-ImageBuffer geometry(OrzaVSMobile::ImageFormat format, int32_t width = kW, int32_t height = kH, int32_t stride = kW) {
+ImageBuffer geometry(ImageFormat format, int32_t width = kW, int32_t height = kH, int32_t stride = kW) {
   return ImageBuffer(0, format, width, height, stride, 1, nullptr);
 }
 
@@ -95,7 +94,7 @@ TEST(EngineLifecycle, DelegatesAreStoredOnlyAsDefined) {
 TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
   send(1.0);  // never answered: the job stays busy
   frame(2.0);  // held while the job awaits its reply
-  ImageBuffer lent = geometry(OrzaVSMobile::GRAY);
+  ImageBuffer lent = geometry(GRAY);
   std::string key;
   engine->requestImageBuffer(lent, key);
   // Whether a frame is held, how many buffers are lent, the last time stamp taken.
@@ -109,7 +108,7 @@ TEST_F(EngineTest, PauseClearsTheFrameBookkeeping) {
   EXPECT_EQ(lent.fillBuffer(textured.data(), kW * kH), kW * kH);
   // Paused: the defined lines, nothing lent, nothing processed.
   orzavs_test::DiagnosticsRecorder diagnostics;
-  ImageBuffer refused = geometry(OrzaVSMobile::GRAY), plain = image();
+  ImageBuffer refused = geometry(GRAY), plain = image();
   std::string refusedKey = "kept";
   engine->requestImageBuffer(refused, refusedKey);
   ExtraFrameData extra;
@@ -132,8 +131,8 @@ TEST(EngineFacade, ANullEventDelegateMeansNoCallbacks) {
   orzavs_test::FakeTransport transport;
   transport.answerEverything();
   Tovra::TovraStateEngineFacade facade(nullptr);
-  std::vector<uint8_t> pixels = orzavs_test::makeFrame(kW, kH, kW, OrzaVSMobile::GRAY);
-  ImageBuffer image(0, OrzaVSMobile::GRAY, kW, kH, kW, 1, pixels.data());
+  std::vector<uint8_t> pixels = orzavs_test::makeFrame(kW, kH, kW, GRAY);
+  ImageBuffer image(0, GRAY, kW, kH, kW, 1, pixels.data());
   ExtraFrameData extra;
   orzavs_test::DiagnosticsRecorder diagnostics;
   facade.addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport, "props are ignored");
@@ -199,7 +198,7 @@ TEST(Sharpness, UsesCrossedMarginsConsecutiveRowsAndTheConstantBelowOneTenth) {
   // (with 0.1, 3). Rows examined: 2..6 (counter 1, 6, 11, 16, 21 < 24); columns 2, 7, 12.
   const int w = 15, h = 25;
   std::vector<uint8_t> plane(static_cast<size_t>(w) * h);
-  ImageBuffer image(0, OrzaVSMobile::GRAY, w, h, w, 1, plane.data());
+  ImageBuffer image(0, GRAY, w, h, w, 1, plane.data());
   // One bright pixel at (x, y) and the sum it gives: a sample, a neighbour of samples, or neither.
   const int cases[][3] = {{2, 2, 9}, {2, 3, 10}, {2, 6, 9}, {2, 7, 1}, {2, 8, 0}, {2, 1, 1}, {3, 2, 2}, {12, 4, 10}};
   for (const auto& c : cases) {
@@ -210,14 +209,14 @@ TEST(Sharpness, UsesCrossedMarginsConsecutiveRowsAndTheConstantBelowOneTenth) {
   // Tiny planes, in guarded memory: samples without their whole neighbourhood are skipped.
   for (const auto& size : {std::make_pair(1, 1), std::make_pair(4, 4), std::make_pair(15, 3), std::make_pair(2, 8)}) {
     orzavs_test::GuardedBytes tiny(std::vector<uint8_t>(static_cast<size_t>(size.first) * size.second, 200));
-    ImageBuffer guarded(0, OrzaVSMobile::GRAY, size.first, size.second, size.first, 1, const_cast<uint8_t*>(tiny.data()));
+    ImageBuffer guarded(0, GRAY, size.first, size.second, size.first, 1, const_cast<uint8_t*>(tiny.data()));
     EXPECT_EQ(TovraStateEngine::sharpness(guarded), 0);
   }
 }
 
 TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
   transport.answerEverything();
-  ImageBuffer lent = geometry(OrzaVSMobile::NV21);
+  ImageBuffer lent = geometry(NV21);
   std::string key;
   engine->requestImageBuffer(lent, key);
   ASSERT_EQ(lent.allocLen, kW * kH * 3 / 2);
@@ -234,14 +233,14 @@ TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
   orzavs_test::DiagnosticsRecorder diagnostics;
   ImageBuffer plain = image();
   engine->process("no-such-key", plain, extra);  // like an empty key: no line
-  std::vector<ImageBuffer> buffers(6, geometry(OrzaVSMobile::GRAY));
+  std::vector<ImageBuffer> buffers(6, geometry(GRAY));
   std::vector<std::string> keys(6, "unchanged");
   for (int i = 0; i < 6; ++i) {
     engine->requestImageBuffer(buffers[i], keys[i]);
     ASSERT_EQ(buffers[i].data != nullptr, i < 5) << i;  // a sixth finds no free record
   }
   EXPECT_EQ(keys[5], "unchanged");
-  buffers[1].format = OrzaVSMobile::RGB;  // refused format
+  buffers[1].format = RGB;  // refused format
   buffers[2].widthStep = kW - 1;          // refused stride
   buffers[3].height = kH + 1;             // more than the lent memory holds
   for (int i = 0; i < 5; ++i) {
@@ -258,7 +257,7 @@ TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
   engine->pauseEngine();  // drops a held frame, if any
   engine->resumeEngine();
   for (int i = 0; i < 5; ++i) {
-    ImageBuffer again = geometry(OrzaVSMobile::GRAY);
+    ImageBuffer again = geometry(GRAY);
     engine->requestImageBuffer(again, key);
     EXPECT_NE(again.data, nullptr) << "record " << i << " was lost";
   }
@@ -267,15 +266,14 @@ TEST_F(EngineTest, LentBuffersAreFilledInPlaceAndAlwaysComeBack) {
 TEST_F(EngineTest, BadFramesPrintOneLineAndLeaveTheEngineWorking) {
   transport.answerEverything();
   const auto bad = [&](int badFormat, int w, int h, int stride, bool pixels = true) {
-    return ImageBuffer(0, static_cast<OrzaVSMobile::ImageFormat>(badFormat), w, h, stride, 1,
-                       pixels ? textured.data() : nullptr);
+    return ImageBuffer(0, static_cast<ImageFormat>(badFormat), w, h, stride, 1, pixels ? textured.data() : nullptr);
   };
   const char* const unsupported = "Failed to process non-GRAY/YUV format in continuous scanning mode\n";
   struct { const char* line; ImageBuffer image; } cases[] = {
-      {"Skipped input frame: image has no pixel data\n", bad(OrzaVSMobile::GRAY, kW, kH, kW, false)},
-      {"Skipped input frame: invalid image size 0x48\n", bad(OrzaVSMobile::GRAY, 0, kH, kW)},
-      {"Skipped input frame: invalid image size 64x-1\n", bad(OrzaVSMobile::NV12, kW, -1, kW)},
-      {"Skipped input frame: row stride -64 is smaller than a row of 64 bytes\n", bad(OrzaVSMobile::I420, kW, kH, -kW)},
+      {"Skipped input frame: image has no pixel data\n", bad(GRAY, kW, kH, kW, false)},
+      {"Skipped input frame: invalid image size 0x48\n", bad(GRAY, 0, kH, kW)},
+      {"Skipped input frame: invalid image size 64x-1\n", bad(NV12, kW, -1, kW)},
+      {"Skipped input frame: row stride -64 is smaller than a row of 64 bytes\n", bad(I420, kW, kH, -kW)},
       {unsupported, bad(-1, kW, kH, kW)}, {unsupported, bad(8, kW, kH, kW)}};
   ExtraFrameData extra;
   for (auto c : cases) {
@@ -292,8 +290,8 @@ TEST_F(EngineTest, BadFramesPrintOneLineAndLeaveTheEngineWorking) {
 TEST_F(EngineTest, SingleImageReturnsOnlyAfterTheReplyWasHandled) {
   transport.answerEverything(orzavs_test::Ms(30));
   const int stride = kW * 3 + 8;  // any layout is accepted here: padded BGR
-  std::vector<uint8_t> bgr = orzavs_test::makeFrame(kW * 3, kH, stride, OrzaVSMobile::BGR);
-  ImageBuffer image(0, OrzaVSMobile::BGR, kW, kH, stride, 3, bgr.data());
+  std::vector<uint8_t> bgr = orzavs_test::makeFrame(kW * 3, kH, stride, BGR);
+  ImageBuffer image(0, BGR, kW, kH, stride, 3, bgr.data());
   ExtraFrameData extra;
   extra.screenOrient = 270;
   engine->processSingleImage(image, extra);
@@ -307,7 +305,7 @@ TEST_F(EngineTest, SingleImageReturnsOnlyAfterTheReplyWasHandled) {
   });
   orzavs_test::DiagnosticsRecorder diagnostics;
   engine->processSingleImage(image, extra);
-  ImageBuffer narrow(0, OrzaVSMobile::BGR, kW, kH, kW * 2, 3, bgr.data());
+  ImageBuffer narrow(0, BGR, kW, kH, kW * 2, 3, bgr.data());
   engine->processSingleImage(narrow, extra);
   EXPECT_EQ(diagnostics.text(),
             "VSS SERVER ERROR: response: \n"
@@ -363,7 +361,7 @@ TEST(FrameRecordManagerTest, HandsOutFreeRecordsWithIncreasingIdsAndRestartsUpTo
 
 TEST(FrameRecordTest, LentBuffersRoundRowsFirstAndAreTakenWithoutACopy) {
   FrameRecord record;
-  ImageBuffer odd = geometry(OrzaVSMobile::NV21, 640, 481, 640);
+  ImageBuffer odd = geometry(NV21, 640, 481, 640);
   ASSERT_TRUE(record.lendBuffer(odd));
   EXPECT_EQ(461440, odd.allocLen);  // (481*3)/2 = 721 rows of 640 bytes
   ExtraFrameData extra;
@@ -373,7 +371,7 @@ TEST(FrameRecordTest, LentBuffersRoundRowsFirstAndAreTakenWithoutACopy) {
   // Time and geometry are taken before the check, the rest is not.
   EXPECT_EQ(std::make_tuple(3.25, 481, 0), std::make_tuple(record.timeStamp, record.height, record.screenOrient));
 
-  ImageBuffer even = geometry(OrzaVSMobile::I420, 64, 48, 80);
+  ImageBuffer even = geometry(I420, 64, 48, 80);
   ASSERT_TRUE(record.lendBuffer(even));
   ASSERT_EQ(80 * 72, even.allocLen);
   const std::vector<uint8_t> frame = pattern(80 * 72);
@@ -382,10 +380,10 @@ TEST(FrameRecordTest, LentBuffersRoundRowsFirstAndAreTakenWithoutACopy) {
   extra.flat = true;
   ASSERT_TRUE(record.setSourceImage(even, extra));
   EXPECT_TRUE(record.pixels.data() == storage && record.pixels == frame);
-  EXPECT_EQ(std::make_tuple(80, int{OrzaVSMobile::I420}, 90, 1),
+  EXPECT_EQ(std::make_tuple(80, int{I420}, 90, 1),
             std::make_tuple(record.widthStep, record.format, record.screenOrient, record.flat));
 
-  ImageBuffer grey = geometry(OrzaVSMobile::GRAY, 10, 7, 12);
+  ImageBuffer grey = geometry(GRAY, 10, 7, 12);
   ASSERT_EQ(50, grey.allocateBuffer(50));  // its own block is freed normally (LeakSanitizer)
   ASSERT_TRUE(record.lendBuffer(grey));
   EXPECT_EQ(84, grey.allocLen);
@@ -395,15 +393,15 @@ TEST(FrameRecordTest, LentBuffersRoundRowsFirstAndAreTakenWithoutACopy) {
 TEST(FrameRecordTest, LendingRefusesBadGeometryAndBoundsTheFill) {
   FrameRecord record;
   uint8_t previous[8] = {0};
-  for (const ImageBuffer& bad : {geometry(OrzaVSMobile::NV21, 8, -2, 8), geometry(OrzaVSMobile::GRAY, 8, 4, -8),
-                                 geometry(OrzaVSMobile::NV12, 65536, 65536, 65536)}) {
+  for (const ImageBuffer& bad : {geometry(NV21, 8, -2, 8), geometry(GRAY, 8, 4, -8),
+                                 geometry(NV12, 65536, 65536, 65536)}) {
     ImageBuffer buffer = bad;
     buffer.data = previous;  // whatever the buffer pointed at before is dropped
     buffer.allocLen = 5;
     EXPECT_FALSE(record.lendBuffer(buffer));
     EXPECT_TRUE(buffer.data == nullptr && buffer.allocLen == 0);
   }
-  ImageBuffer buffer = geometry(OrzaVSMobile::GRAY, 4, 4, 4);
+  ImageBuffer buffer = geometry(GRAY, 4, 4, 4);
   ASSERT_TRUE(record.lendBuffer(buffer));
   buffer.allocLen = 1000;  // forged: the fill still stops at the record's 16 bytes
   EXPECT_EQ(16, buffer.fillBuffer(pattern(1000).data(), 1000));
@@ -414,28 +412,26 @@ TEST(FrameRecordTest, LendingRefusesBadGeometryAndBoundsTheFill) {
 TEST(FrameRecordTest, CopiesSourcesThatHoldTheirGeometryAndRefusesTheRest) {
   FrameRecord record;
   const ExtraFrameData extra;
-  struct Case { OrzaVSMobile::ImageFormat format; int width, height, stride; size_t bytes; };
+  struct Case { ImageFormat format; int width, height, stride; size_t bytes; };
   // YUV frames take widthStep * height * 3 / 2 bytes, every other layout widthStep * height.
-  for (const Case& c : {Case{OrzaVSMobile::NV21, 16, 12, 16, 288}, Case{OrzaVSMobile::GRAY, 10, 5, 10, 50},
-                        Case{OrzaVSMobile::RGB, 10, 4, 30, 120}}) {
+  for (const Case& c : {Case{NV21, 16, 12, 16, 288}, Case{GRAY, 10, 5, 10, 50}, Case{RGB, 10, 4, 30, 120}}) {
     std::vector<uint8_t> pixels = pattern(c.bytes);
     ImageBuffer image(0, c.format, c.width, c.height, c.stride, 3, pixels.data());
     ASSERT_TRUE(record.setSourceImage(image, extra));
     EXPECT_EQ(pixels, record.pixels);
   }
   std::vector<uint8_t> pixels(64, 1);
-  EXPECT_FALSE(record.setSourceImage(ImageBuffer(0, OrzaVSMobile::GRAY, 8, 8, 8, 1, nullptr), extra));
-  EXPECT_FALSE(record.setSourceImage(ImageBuffer(0, OrzaVSMobile::GRAY, 8, -8, 8, 1, pixels.data()), extra));
+  EXPECT_FALSE(record.setSourceImage(ImageBuffer(0, GRAY, 8, 8, 8, 1, nullptr), extra));
+  EXPECT_FALSE(record.setSourceImage(ImageBuffer(0, GRAY, 8, -8, 8, 1, pixels.data()), extra));
   // An own block shorter than the geometry says would be overrun.
-  ImageBuffer owned(0, OrzaVSMobile::NV21, 8, 8, 8, 1, nullptr);
+  ImageBuffer owned(0, NV21, 8, 8, 8, 1, nullptr);
   ASSERT_EQ(95, owned.allocateBuffer(95));  // NV21 8x8 needs 96 bytes
   EXPECT_FALSE(record.setSourceImage(owned, extra));
   ASSERT_EQ(96, owned.allocateBuffer(96));
   EXPECT_TRUE(record.setSourceImage(owned, extra));
   owned.releaseBuffer();  // a released buffer's stale pointer is never read
   EXPECT_FALSE(record.setSourceImage(owned, extra));
-  EXPECT_TRUE(record.setSourceImage(ImageBuffer(0, OrzaVSMobile::GRAY, 0, 0, 0, 1, nullptr), extra) &&
-              record.pixels.empty());
+  EXPECT_TRUE(record.setSourceImage(ImageBuffer(0, GRAY, 0, 0, 0, 1, nullptr), extra) && record.pixels.empty());
 }
 
 }  // namespace

@@ -30,11 +30,9 @@ TEST(VisualSearchRequest, FixedPartsAreExact) {
             "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}");
   EXPECT_EQ(Tovra::visualSearchRequestId(1700000000, 17), "TovraStateEngine-1700000000-17");
   EXPECT_EQ(Tovra::visualSearchRequestId(0, UINT64_MAX), "TovraStateEngine-0-18446744073709551615");
-  // (orientation + 90) % 360 with the sign of the dividend, without overflow.
-  const int32_t orientations[] = {0, 90, 270, -90, -180, INT32_MAX, INT32_MIN};
-  const int32_t rotations[] = {90, 180, 0, 0, -90, static_cast<int32_t>((int64_t{INT32_MAX} + 90) % 360),
-                               static_cast<int32_t>((int64_t{INT32_MIN} + 90) % 360)};
-  for (size_t i = 0; i < 7; ++i) EXPECT_EQ(Tovra::visualSearchRotation(orientations[i]), rotations[i]);
+  // (orientation + 90) % 360 with the sign of the dividend, without overflow (2^31 + 89 leaves 217).
+  const int32_t cases[][2] = {{0, 90}, {90, 180}, {270, 0}, {-90, 0}, {-180, -90}, {INT32_MAX, 217}, {INT32_MIN, -38}};
+  for (const auto& c : cases) EXPECT_EQ(Tovra::visualSearchRotation(c[0]), c[1]) << c[0];
 }
 
 TEST(VisualSearchRequest, ReusedRequestKeepsFirstParamsAndLastQueryEntries) {
@@ -76,11 +74,7 @@ TEST(VisualSearchRequest, ReusedRequestKeepsFirstParamsAndLastQueryEntries) {
 
 using Tovra::ObjectInfo;
 
-struct Parsed {
-  bool ok = false;
-  std::vector<ObjectInfo> results;
-  Tovra::ResultMetadata metadata;
-};
+struct Parsed { bool ok = false; std::vector<ObjectInfo> results; Tovra::ResultMetadata metadata; };
 
 Parsed parse(const std::string& text) {
   Parsed p;

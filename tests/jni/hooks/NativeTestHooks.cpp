@@ -28,25 +28,22 @@ bool isAttached(JavaVM* vm) {
 }
 
 // Runs `call` on a new native thread and describes it, as a Java string: "detached-before;" or
-// "attached-before;", what `call` said, "threw=<type>:<what>;" if it threw, and
+// "attached-before;", what `call` said, "threw=<type>:<what>;" if it threw a std::exception, and
 // "detached-after" or "attached-after".
 template <class Call>
 jstring onNativeThread(JNIEnv* env, Call call) {
   JavaVM* vm = nullptr;
   env->GetJavaVM(&vm);
   std::string report;
-  std::thread worker([&] {
+  std::thread([&] {
     report += isAttached(vm) ? "attached-before;" : "detached-before;";
     try {
       report += call();
     } catch (const std::exception& e) {
       report += std::string("threw=") + typeid(e).name() + ":" + e.what() + ";";
-    } catch (...) {
-      report += "threw=unknown;";
     }
     report += isAttached(vm) ? "attached-after" : "detached-after";
-  });
-  worker.join();
+  }).join();
   return env->NewStringUTF(report.c_str());
 }
 

@@ -25,8 +25,7 @@ std::string label(int format, int w, int h) {
 }
 
 // Both helpers encode a frame in guarded memory: a read past it (encoder or library) crashes.
-std::vector<uint8_t> yuvJpeg(const std::vector<uint8_t>& frame, int w, int h, ImageFormat format,
-                             int q = 90) {
+std::vector<uint8_t> yuvJpeg(const std::vector<uint8_t>& frame, int w, int h, ImageFormat format, int q = 90) {
   GuardedBytes guarded(frame);
   std::vector<uint8_t> out, work;
   EXPECT_TRUE(encodeYUVToJpeg(guarded.data(), h, w, w, format, out, q, work)) << label(format, w, h);
@@ -37,8 +36,7 @@ std::vector<uint8_t> packedJpeg(const std::vector<uint8_t>& frame, int w, int h,
                                 ImageFormat format, int q = 90) {
   GuardedBytes guarded(frame);
   std::vector<uint8_t> out, work;
-  EXPECT_TRUE(encodePackedToJpeg(guarded.data(), h, w, stride, channels, format, out, q, work))
-      << label(format, w, h);
+  EXPECT_TRUE(encodePackedToJpeg(guarded.data(), h, w, stride, channels, format, out, q, work)) << label(format, w, h);
   return out;
 }
 
@@ -47,8 +45,7 @@ std::vector<uint8_t> packedFrame(int w, int h, int channels, int stride) {
   std::vector<uint8_t> px(static_cast<size_t>(h - 1) * stride + static_cast<size_t>(w) * channels, 0xC3);
   for (int r = 0; r < h; ++r)
     for (int i = 0; i < w * channels; ++i)
-      px[static_cast<size_t>(r) * stride + i] =
-          clampByte(128 + 60 * std::sin(i / 17.0) + 40 * std::cos(r / 29.0));
+      px[static_cast<size_t>(r) * stride + i] = clampByte(128 + 60 * std::sin(i / 17.0) + 40 * std::cos(r / 29.0));
   return px;
 }
 

@@ -37,9 +37,6 @@ inline uint8_t clampByte(double v) {
 // sample (which compresses badly, so streams are long).
 inline Yuv420 makeYuv(int width, int height, bool noise = false) {
   Yuv420 img{width, height, {}, {}, {}};
-  img.y.resize(static_cast<size_t>(width) * height);
-  img.u.resize(static_cast<size_t>(img.cw()) * img.ch());
-  img.v.resize(img.u.size());
   uint32_t state = 12345;
   auto next = [&] {
     state ^= state << 13, state ^= state >> 17, state ^= state << 5;
@@ -47,14 +44,12 @@ inline Yuv420 makeYuv(int width, int height, bool noise = false) {
   };
   for (int r = 0; r < height; ++r)
     for (int c = 0; c < width; ++c)
-      img.y[static_cast<size_t>(r) * width + c] =
-          noise ? next() : clampByte(128 + 50 * std::sin(c / 23.0) + 40 * std::cos(r / 31.0) + 0.1 * (c - r));
+      img.y.push_back(noise ? next()
+                            : clampByte(128 + 50 * std::sin(c / 23.0) + 40 * std::cos(r / 31.0) + 0.1 * (c - r)));
   for (int r = 0; r < img.ch(); ++r)
     for (int c = 0; c < img.cw(); ++c) {
-      img.u[static_cast<size_t>(r) * img.cw() + c] =
-          noise ? next() : clampByte(128 + 40 * std::sin((c + r) / 19.0));
-      img.v[static_cast<size_t>(r) * img.cw() + c] =
-          noise ? next() : clampByte(120 + 35 * std::cos((c - 2 * r) / 27.0));
+      img.u.push_back(noise ? next() : clampByte(128 + 40 * std::sin((c + r) / 19.0)));
+      img.v.push_back(noise ? next() : clampByte(120 + 35 * std::cos((c - 2 * r) / 27.0)));
     }
   return img;
 }

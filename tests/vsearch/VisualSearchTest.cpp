@@ -146,8 +146,7 @@ TEST(VisualSearchResponseParser, MissingOrMistypedMembersFailAtTheirStep) {
               std::make_tuple(p.ok, p.metadata.queryID, p.metadata.mobileDecorator));
   }
   for (const std::string& text : std::vector<std::string>{
-           R"({"queryId":"q","quillmark":{"searchResult":[]}})",
-           R"({"queryId":"q","quillmark":{"resultMetadata":{}}})",
+           R"({"queryId":"q","quillmark":{"searchResult":[]}})", R"({"queryId":"q","quillmark":{"resultMetadata":{}}})",
            R"({"queryId":"q","quillmark":{"resultMetadata":{"finalAccumulation":"true"}}})",
            R"({"queryId":"q","quillmark":{"resultMetadata":{"finalAccumulation":true,"accumulatedQueries":[1]}}})",
            R"({"queryId":7,"quillmark":{}})", R"({"queryId":"q","quillmark":"text"})", R"(["queryId"])", "42",

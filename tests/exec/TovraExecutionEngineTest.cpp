@@ -63,12 +63,9 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   for (auto& job : waiting) engine.addJob(job.get());
   engine.cancelJobs();
   TestJob refused(4);
-  {
-    DiagnosticsRecorder diagnostics;
-    engine.addJob(&refused);
-    EXPECT_EQ("", diagnostics.text());  // refused before it was marked: no message, still Idle
-  }
-  EXPECT_EQ(Tovra::Idle, refused.state());
+  DiagnosticsRecorder diagnostics;  // the only line comes from the race at the end
+  engine.addJob(&refused);
+  EXPECT_EQ(Tovra::Idle, refused.state());  // refused before it was marked: no message, still Idle
   release.open();
   for (auto& job : waiting) ASSERT_TRUE(job->waitForState(Tovra::Finished));
   for (auto& job : waiting) EXPECT_EQ(0, job->runs());  // taken after the cancel: not run
@@ -85,7 +82,6 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   // refusal and settles the job.
   TestJob racing(6);
   racing.onMarkQueued = [&](TestJob&) { engine.cancelJobs(); };
-  DiagnosticsRecorder diagnostics;
   engine.addJob(&racing);
   EXPECT_EQ("Error: Adding job to stopped/canceled execution engine\n", diagnostics.text());
   EXPECT_EQ(outcome(Tovra::Finished, 0), racing.outcome());

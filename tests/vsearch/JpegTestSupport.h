@@ -88,15 +88,10 @@ struct Decoded {
   std::vector<uint8_t> pixels;
 };
 
-namespace detail {
 struct DecodeError {
   jpeg_error_mgr pub;
   std::jmp_buf jump;
 };
-[[noreturn]] inline void decodeErrorExit(j_common_ptr c) {
-  std::longjmp(reinterpret_cast<DecodeError*>(c->err)->jump, 1);
-}
-inline void silent(j_common_ptr) {}
 
 // Reads the header, then every scan line, into `d`. Only trivially destructible objects live in
 // this frame because the error hook longjmps back (the pixels belong to the caller's `d`).
@@ -105,8 +100,8 @@ inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Dec
   std::memset(&c, 0, sizeof c);
   DecodeError err;
   c.err = jpeg_std_error(&err.pub);
-  err.pub.error_exit = decodeErrorExit;
-  err.pub.output_message = silent;
+  err.pub.error_exit = [](j_common_ptr info) { std::longjmp(reinterpret_cast<DecodeError*>(info->err)->jump, 1); };
+  err.pub.output_message = [](j_common_ptr) {};  // silent
   if (setjmp(err.jump)) {
     jpeg_destroy_decompress(&c);
     return false;
@@ -138,11 +133,10 @@ inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Dec
   jpeg_destroy_decompress(&c);
   return true;
 }
-}  // namespace detail
 
 inline Decoded decodeJpeg(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space = JCS_YCbCr) {
   Decoded d;
-  d.ok = !jpeg.empty() && detail::decodeRaw(jpeg, space, &d);
+  d.ok = !jpeg.empty() && decodeRaw(jpeg, space, &d);
   return d;
 }
 

@@ -20,7 +20,7 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
   TestJob added(20, &log);
   // The first job holds the worker until all others are queued, so they really wait in line.
   jobs[0]->work = [&](TestJob&) { gate.wait(); };
-  jobs[5]->endAwaitingReply = true;
+  jobs[5]->work = [](TestJob& job) { job.awaitReply(); };
   {
     DiagnosticsRecorder diagnostics;
     TovraExecutionEngine engine(1);

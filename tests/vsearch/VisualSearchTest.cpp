@@ -76,8 +76,9 @@ using Tovra::ObjectInfo;
 
 struct Parsed { bool ok = false; std::vector<ObjectInfo> results; Tovra::ResultMetadata metadata; };
 
-Parsed parse(const std::string& text) {
+Parsed parse(const std::string& text, size_t staleResults = 0) {
   Parsed p;
+  p.results.resize(staleResults);
   p.ok = Tovra::parseVisualSearchResponse(text, p.results, p.metadata);
   return p;
 }
@@ -164,10 +165,8 @@ TEST(VisualSearchResponseParser, HostileTextNeverThrowsOrOverflows) {
   static const char kNul[] = "{\"queryId\":\"a\0b\"}";
   for (const std::string& text : {std::string(""), std::string("not json"), std::string("{\"queryId\":\"q\""),
                                  std::string("{}garbage"), std::string("\xff\xfe"), std::string(kNul, sizeof kNul - 1)}) {
-    std::vector<ObjectInfo> results(3);
-    Tovra::ResultMetadata metadata;
-    EXPECT_FALSE(Tovra::parseVisualSearchResponse(text, results, metadata)) << text;
-    EXPECT_EQ(results.size(), 3u);  // untouched
+    const Parsed p = parse(text, 3);
+    EXPECT_TRUE(!p.ok && p.results.size() == 3u) << text;  // the results are left untouched
   }
   // Nesting beyond the limit is refused (properties are serialised recursively, subContent is
   // read recursively); up to the limit it is read, and brackets inside strings do not count.

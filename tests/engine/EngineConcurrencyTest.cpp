@@ -104,7 +104,6 @@ TEST(EngineStress, ClientsLifecycleAndTransportRaceWithoutLosingOrDuplicatingCal
   ASSERT_TRUE(waitFor([&] { return transport.idle(); }));
 
   EXPECT_TRUE(transport.sent().size() > 0 && events.frames.load() > 0);
-  EXPECT_EQ(transport.pushedCount() + transport.droppedCount(), transport.sent().size());
   // Each 200 reply carried a unique token as its query id, every other reply was a 503.
   const std::vector<Tovra::ResultMetadata> decoded = events.metadata();
   const std::vector<ErrorCall> errors = events.errors();

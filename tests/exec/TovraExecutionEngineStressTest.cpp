@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "exec/TovraExecutionEngine.h"
-#include "support/StdoutCapture.h"
+#include "support/DiagnosticsRecorder.h"
 #include "support/TestJob.h"
 
 using namespace orzavs_test;
@@ -22,7 +22,7 @@ TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
   std::vector<std::unique_ptr<TestJob>> jobs = makeJobs(0, kProducers * kJobsEach - 1);
   for (auto& job : jobs) job->work = [](TestJob&) { std::this_thread::sleep_for(microseconds(100)); };
 
-  StdoutCapture out;  // the refusal line may be printed any number of times
+  DiagnosticsRecorder diagnostics;  // the refusal line may be printed any number of times
   {
     TovraExecutionEngine engine(2);
     std::atomic<bool> producing{true};
@@ -60,7 +60,7 @@ TEST(TovraExecutionEngineStressTest, ProducersWorkersAndCancelTogglingAgree) {
   }
   EXPECT_GT(ran, 0);
   // Each refusal line belongs to a job that was marked and then finished without running.
-  const std::string text = out.text(), refusal = "Error: Adding job to stopped/canceled execution engine\n";
+  const std::string text = diagnostics.text(), refusal = "Error: Adding job to stopped/canceled execution engine\n";
   int refusals = 0;
   for (size_t at = text.find(refusal); at != std::string::npos; at = text.find(refusal, at + 1)) ++refusals;
   EXPECT_LE(refusals, settledUnrun);

@@ -7,7 +7,7 @@
 #include <thread>
 #include <vector>
 
-#include "support/StdoutCapture.h"
+#include "support/DiagnosticsRecorder.h"
 #include "support/TestJob.h"
 
 using namespace orzavs_test;
@@ -20,9 +20,9 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
   TestJob added(20, &log);
   // The first job holds the worker until all others are queued, so they really wait in line.
   jobs[0]->work = [&](TestJob&) { gate.wait(); };
-  jobs[5]->endAwaitingReply = true;
+  jobs[5]->work = [](TestJob& job) { job.awaitReply(); };
   {
-    StdoutCapture out;
+    DiagnosticsRecorder diagnostics;
     TovraExecutionEngine engine(1);
     jobs[19]->work = [&](TestJob&) { engine.addJob(&added); };  // a job adding a job
     engine.addJob(nullptr);  // ignored silently
@@ -30,7 +30,7 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
     EXPECT_EQ(Tovra::Queued, jobs[1]->state());
     gate.open();
     ASSERT_TRUE(added.waitForState(Tovra::Finished));
-    EXPECT_EQ("", out.text());
+    EXPECT_EQ("", diagnostics.text());
   }
   std::vector<int> expected(21);
   std::iota(expected.begin(), expected.end(), 0);
@@ -43,9 +43,9 @@ TEST(TovraExecutionEngineTest, OneWorkerRunsJobsInTheOrderAddedAndSettlesAllButA
 TEST(TovraExecutionEngineTest, ZeroThreadsPrintsTheMessageAndNeverRuns) {
   TestJob job(1);
   {
-    StdoutCapture out;
+    DiagnosticsRecorder diagnostics;
     TovraExecutionEngine engine(0);
-    EXPECT_EQ("Initialized TovraExecutionEngine with invalid number of threads\n", out.text());
+    EXPECT_EQ("Initialized TovraExecutionEngine with invalid number of threads\n", diagnostics.text());
     engine.addJob(&job);
     std::this_thread::sleep_for(Ms(20));
   }
@@ -63,12 +63,9 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   for (auto& job : waiting) engine.addJob(job.get());
   engine.cancelJobs();
   TestJob refused(4);
-  {
-    StdoutCapture out;
-    engine.addJob(&refused);
-    EXPECT_EQ("", out.text());  // refused before it was marked: no message, still Idle
-  }
-  EXPECT_EQ(Tovra::Idle, refused.state());
+  DiagnosticsRecorder diagnostics;  // the only line comes from the race at the end
+  engine.addJob(&refused);
+  EXPECT_EQ(Tovra::Idle, refused.state());  // refused before it was marked: no message, still Idle
   release.open();
   for (auto& job : waiting) ASSERT_TRUE(job->waitForState(Tovra::Finished));
   for (auto& job : waiting) EXPECT_EQ(0, job->runs());  // taken after the cancel: not run
@@ -85,9 +82,8 @@ TEST(TovraExecutionEngineTest, CancelRefusesNewJobsAndSettlesQueuedOnesUntilResu
   // refusal and settles the job.
   TestJob racing(6);
   racing.onMarkQueued = [&](TestJob&) { engine.cancelJobs(); };
-  StdoutCapture out;
   engine.addJob(&racing);
-  EXPECT_EQ("Error: Adding job to stopped/canceled execution engine\n", out.text());
+  EXPECT_EQ("Error: Adding job to stopped/canceled execution engine\n", diagnostics.text());
   EXPECT_EQ(outcome(Tovra::Finished, 0), racing.outcome());
 }
 
@@ -105,8 +101,7 @@ TEST(TovraExecutionEngineTest, DestructionSettlesQueuedJobsAndJoins) {
     release.open();
   });
   engine.reset();  // returns only once the worker drained the queue and was joined
-  EXPECT_TRUE(release.isOpen());
-  EXPECT_EQ(Tovra::Finished, running.state());
+  EXPECT_EQ(Tovra::Finished, running.state());  // it could not finish before the release
   // Taken after stopping was set: settled, not run.
   for (auto& job : queued) EXPECT_EQ(outcome(Tovra::Finished, 0), job->outcome());
   releaser.join();

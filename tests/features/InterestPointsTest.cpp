@@ -16,6 +16,7 @@
 #include <vector>
 
 #include "Fast9Reference.h"
+#include "support/GuardedBytes.h"
 
 namespace OrzaVSMobile {
 void PrintTo(const Fast9Corner& c, std::ostream* out) { *out << "(" << c.x << "," << c.y << ")"; }
@@ -25,7 +26,7 @@ namespace {
 
 using namespace OrzaVSMobile;
 using fast9ref::Content;
-using fast9ref::GuardedPlane;
+using orzavs_test::GuardedBytes;
 using Result = fast9ref::Detection;
 constexpr Fast9Path kPaths[] = {Fast9Path::Best, Fast9Path::Scalar};
 
@@ -75,7 +76,7 @@ TEST(Fast9Test, MatchesReferenceOnVariedPlanes) {
       for (int h : {7, 8, 12, 19}) {
         const int stride = w + static_cast<int>(rng() % 3) * 7;  // packed or padded rows
         const int b = thresholds[rng() % 10];
-        GuardedPlane plane(fast9ref::makePlane(w, h, stride, content, rng));
+        GuardedBytes plane(fast9ref::makePlane(w, h, stride, content, rng));
         expectAgreement(plane.data(), w, h, stride, b, true);
       }
     }
@@ -89,10 +90,10 @@ TEST(Fast9Test, KernelsAgreeOnLargePlanesAndKeepManyCorners) {
   for (int round = 0; round < 24; ++round) {
     const int w = 7 + static_cast<int>(rng() % 300), h = 7 + static_cast<int>(rng() % 60);
     const int stride = w + static_cast<int>(rng() % 20);
-    GuardedPlane plane(fast9ref::makePlane(w, h, stride, static_cast<Content>(rng() % 4), rng));
+    GuardedBytes plane(fast9ref::makePlane(w, h, stride, static_cast<Content>(rng() % 4), rng));
     for (int b : {0, static_cast<int>(rng() % 255), 50}) expectAgreement(plane.data(), w, h, stride, b, false);
   }
-  GuardedPlane noise(fast9ref::makePlane(150, 110, 150, Content::Noise, rng));
+  GuardedBytes noise(fast9ref::makePlane(150, 110, 150, Content::Noise, rng));
   for (int b : {20, 50}) {
     EXPECT_GT(detect(noise.data(), 150, 110, 150, b, Fast9Path::Best, true).corners.size(), 512u);  // raw has more
     expectAgreement(noise.data(), 150, 110, 150, b, true);
@@ -167,7 +168,7 @@ TEST(Fast9Test, DegenerateGeometryHasNoCornersAndReadsNothingOutside) {
   }
   // Planes under 7 in either direction, in guarded memory of exactly their size.
   for (const auto& g : {std::array<int, 2>{1, 1}, {6, 30}, {30, 6}, {7, 6}, {6, 7}}) {
-    GuardedPlane p(fast9ref::makePlane(g[0], g[1], g[0], Content::Noise, rng));
+    GuardedBytes p(fast9ref::makePlane(g[0], g[1], g[0], Content::Noise, rng));
     expectNone(p.data(), g[0], g[1], g[0]);
   }
 }

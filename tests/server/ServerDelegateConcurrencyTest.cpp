@@ -7,10 +7,8 @@
 #include <memory>
 #include <string>
 #include <thread>
-#include <vector>
 
 #include "support/Fakes.h"
-#include "support/TestJob.h"
 
 using namespace orzavs_test;
 using Tovra::Server::ServerResponse;

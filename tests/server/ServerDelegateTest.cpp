@@ -34,17 +34,17 @@ TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {
   RecordingHandler first, second;
   EXPECT_TRUE(transport.sendServerRequest(makeRequest("dup", &first)));
   transport.sendServerRequest(makeRequest("dup", &second));
-  EXPECT_EQ(2u, transport.sentCount());  // both still go to the transport
+  EXPECT_EQ(2u, transport.sent().size());  // both still go to the transport
   EXPECT_EQ(1u, transport.pendingCount());
   for (const char* stray : {"never-sent", "dup ", "DUP"}) transport.pushServerResponse(makeResponse(stray, "x"));
-  EXPECT_EQ(0u, first.count());
+  EXPECT_EQ(0u, first.responses().size());
 
   transport.pushServerResponse(makeResponse("dup", "first", 503));
   transport.pushServerResponse(makeResponse("dup", "second"));
-  ASSERT_EQ(1u, first.count());
+  ASSERT_EQ(1u, first.responses().size());
   EXPECT_EQ(std::make_pair(std::string("first"), 503),
             std::make_pair(first.responses()[0].responseStr, first.responses()[0].responseCode));
-  EXPECT_EQ(std::make_pair(size_t{0}, size_t{0}), std::make_pair(second.count(), transport.pendingCount()));
+  EXPECT_EQ(std::make_pair(size_t{0}, size_t{0}), std::make_pair(second.responses().size(), transport.pendingCount()));
 
   // Once answered, the id is free again; a null handler is registered and its reply consumed.
   transport.sendServerRequest(makeRequest("dup", nullptr));
@@ -52,20 +52,20 @@ TEST(ServerDelegateTest, EachPendingIdIsAnsweredOnceToItsFirstHandler) {
   transport.pushServerResponse(makeResponse("dup"));
   transport.sendServerRequest(makeRequest("dup", &second));
   transport.pushServerResponse(makeResponse("dup"));
-  EXPECT_EQ(1u, second.count());
+  EXPECT_EQ(1u, second.responses().size());
 
   // A reply pushed by another thread while the transfer is still running is routed.
   transport.onSend = [&](const ServerRequest& request) {
     std::thread([&transport, id = request.id] { transport.pushServerResponse(makeResponse(id, "early")); }).join();
   };
   transport.sendServerRequest(makeRequest("early", &second));
-  ASSERT_EQ(2u, second.count());
+  ASSERT_EQ(2u, second.responses().size());
   EXPECT_EQ("early", second.responses()[1].responseStr);
   transport.onSend = nullptr;
   transport.result = false;  // a failed transfer keeps its registration
   EXPECT_FALSE(transport.sendServerRequest(makeRequest("failing", &second)));
   transport.pushServerResponse(makeResponse("failing", "", 0));
-  EXPECT_EQ(3u, second.count());
+  EXPECT_EQ(3u, second.responses().size());
 }
 
 TEST(ServerDelegateTest, ForgetDropsOnlyThatHandlerAndWorksFromItsOwnCallback) {
@@ -75,7 +75,7 @@ TEST(ServerDelegateTest, ForgetDropsOnlyThatHandlerAndWorksFromItsOwnCallback) {
   transport.sendServerRequest(makeRequest("b", &kept));
   transport.forgetHandler(&gone);
   for (const char* id : {"a", "b"}) transport.pushServerResponse(makeResponse(id));
-  EXPECT_EQ(std::make_pair(size_t{0}, size_t{1}), std::make_pair(gone.count(), kept.count()));
+  EXPECT_EQ(std::make_pair(size_t{0}, size_t{1}), std::make_pair(gone.responses().size(), kept.responses().size()));
 
   RecordingHandler handler;
   handler.onResponse = [&](const ServerResponse& response) {
@@ -86,7 +86,7 @@ TEST(ServerDelegateTest, ForgetDropsOnlyThatHandlerAndWorksFromItsOwnCallback) {
   transport.pushServerResponse(makeResponse("step-1"));
   EXPECT_EQ(0u, transport.pendingCount());  // step-2 was forgotten inside the callback
   transport.pushServerResponse(makeResponse("step-2"));
-  EXPECT_EQ(1u, handler.count());
+  EXPECT_EQ(1u, handler.responses().size());
 
   // A throwing handler leaves no delivery mark behind: forgetting it does not wait forever.
   handler.onResponse = [](const ServerResponse&) { throw std::runtime_error("handler failed"); };

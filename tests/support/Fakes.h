@@ -120,11 +120,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
       Tovra::Server::ServerResponse reply;
       reply.id = copy.id;
       Ms delay(0);
-      if (responder_ && responder_(copy, reply, delay)) {
-        queue_.push_back({reply, Clock::now() + delay});
-      } else if (responder_) {
-        ++dropped_;
-      }
+      if (responder_ && responder_(copy, reply, delay)) queue_.push_back({reply, Clock::now() + delay});
     }
     wake_.notify_all();
     if (onSend) onSend(request);
@@ -138,9 +134,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   }
 
   std::vector<SentRequest> sent() const { return locked([this] { return sent_; }); }
-  size_t sentCount() const { return locked([this] { return sent_.size(); }); }
   size_t pushedCount() const { return locked([this] { return pushed_; }); }
-  size_t droppedCount() const { return locked([this] { return dropped_; }); }
   bool idle() const { return locked([this] { return queue_.empty() && !pushing_; }); }  // all pushed
 
  private:
@@ -177,7 +171,7 @@ class FakeTransport : public Tovra::Server::ServerDelegate {
   Responder responder_;
   std::vector<SentRequest> sent_;
   std::deque<Scheduled> queue_;
-  size_t pushed_ = 0, dropped_ = 0;
+  size_t pushed_ = 0;
   std::thread thread_;  // last: starts once every other member exists
 };
 
@@ -213,7 +207,6 @@ class RecordingHandler : public Tovra::Server::ServerResponseHandler {
     std::lock_guard<std::mutex> lock(mutex_);
     return responses_;
   }
-  size_t count() const { return responses().size(); }
   std::function<void(const Tovra::Server::ServerResponse&)> onResponse;
 
  private:
@@ -222,34 +215,26 @@ class RecordingHandler : public Tovra::Server::ServerResponseHandler {
 };
 
 inline Tovra::Server::ServerRequest makeRequest(const std::string& id, Tovra::Server::ServerResponseHandler* handler) {
-  Tovra::Server::ServerRequest request;
-  request.id = id;
+  Tovra::Server::ServerRequest request(OrzaVSMobile::ByteArray(), id);
   request.responseHandler = handler;
   return request;
 }
 
 inline Tovra::Server::ServerResponse makeResponse(const std::string& id, const std::string& body = "",
                                                   int32_t code = 200, double roundtripTime = -1.0) {
-  Tovra::Server::ServerResponse response;
-  response.id = id;
-  response.responseStr = body;
-  response.responseCode = code;
-  response.roundtripTime = roundtripTime;
-  return response;
+  return Tovra::Server::ServerResponse{false, code, id, body, roundtripTime};
 }
 
-// A started engine wired to a recording delegate and transport, fed 64x48 frames of `format`:
-// textured, or uniform with `flat`.
+// A started engine wired to a recording delegate and transport, fed 64x48 NV21 frames: textured,
+// or uniform with `isFlat`.
 struct EngineRig {
-  explicit EngineRig(OrzaVSMobile::ImageFormat frameFormat = OrzaVSMobile::NV21)
-      : format(frameFormat), textured(makeFrame(64, 48, 64, format)), flat(makeFrame(64, 48, 64, format, true)),
-        engine(new Tovra::TovraStateEngine) {
+  EngineRig() {
     engine->setEventDelegate(&events);
     engine->addObjectModule(Tovra::VISUAL_SEARCH_SERVICE_MOD, &transport);
     engine->startEngine();
   }
   OrzaVSMobile::ImageBuffer image(bool isFlat = false) {
-    return OrzaVSMobile::ImageBuffer(0, format, 64, 48, 64, 1, (isFlat ? flat : textured).data());
+    return OrzaVSMobile::ImageBuffer(0, OrzaVSMobile::NV21, 64, 48, 64, 1, (isFlat ? flat : textured).data());
   }
   void frame(double t, bool isFlat = false) {
     OrzaVSMobile::ImageBuffer pixels = image(isFlat);
@@ -262,19 +247,19 @@ struct EngineRig {
   // (for a transport that does not answer at once).
   std::string send(double t) {
     EXPECT_TRUE(jobIdle());
-    const size_t before = transport.sentCount();
+    const size_t before = transport.sent().size();
     frame(t);
     EXPECT_TRUE(waitFor([&] {
-      return transport.sentCount() == before + 1 && engine->job(0).state() == Tovra::AwaitingReply;
+      return transport.sent().size() == before + 1 && engine->job(0).state() == Tovra::AwaitingReply;
     }));
     return transport.sent().back().id;
   }
 
   RecordingEvents events;
   FakeTransport transport;
-  const OrzaVSMobile::ImageFormat format;
-  std::vector<uint8_t> textured, flat;
-  std::unique_ptr<Tovra::TovraStateEngine> engine;  // last: destroyed before its delegates
+  std::vector<uint8_t> textured = makeFrame(64, 48, 64, OrzaVSMobile::NV21);
+  std::vector<uint8_t> flat = makeFrame(64, 48, 64, OrzaVSMobile::NV21, true);
+  std::unique_ptr<Tovra::TovraStateEngine> engine{new Tovra::TovraStateEngine};  // last: destroyed before its delegates
 };
 
 }  // namespace orzavs_test

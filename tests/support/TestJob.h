@@ -28,24 +28,20 @@ class TestJob : public Tovra::Job {
     runs_.fetch_add(1);
     if (log_ != nullptr) log_->push_back(id_);
     if (work) work(*this);
-    if (endAwaitingReply) state_.store(Tovra::AwaitingReply);
   }
   void finishUnlessAwaiting() override {
     if (state_.load() != Tovra::AwaitingReply) state_.store(Tovra::Finished);
   }
 
-  bool waitForState(int32_t wanted, Ms timeout = Ms(10000)) {
-    return waitFor([&] { return state_.load() == wanted; }, timeout);
-  }
-
+  bool waitForState(int32_t wanted) { return waitFor([&] { return state_.load() == wanted; }, Ms(10000)); }
+  // From `work`: run() ends in AwaitingReply instead of leaving the state to the executor.
+  void awaitReply() { state_.store(Tovra::AwaitingReply); }
   int32_t state() const { return state_.load(); }
   int runs() const { return runs_.load(); }
   std::pair<int32_t, int> outcome() const { return {state(), runs()}; }
 
   // Run inside run() and markQueued(), after the state became Running or Queued.
   std::function<void(TestJob&)> work, onMarkQueued;
-  // When set, run() ends in AwaitingReply instead of leaving the state to the executor.
-  bool endAwaitingReply = false;
 
  private:
   const int id_;

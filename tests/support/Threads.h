@@ -25,7 +25,6 @@ class Gate {
  public:
   void open() { open_ = true; }
   bool wait(Ms timeout = Ms(10000)) const { return waitFor([this] { return open_.load(); }, timeout); }
-  bool isOpen() const { return open_; }
 
  private:
   std::atomic<bool> open_{false};

@@ -37,9 +37,6 @@ inline uint8_t clampByte(double v) {
 // sample (which compresses badly, so streams are long).
 inline Yuv420 makeYuv(int width, int height, bool noise = false) {
   Yuv420 img{width, height, {}, {}, {}};
-  img.y.resize(static_cast<size_t>(width) * height);
-  img.u.resize(static_cast<size_t>(img.cw()) * img.ch());
-  img.v.resize(img.u.size());
   uint32_t state = 12345;
   auto next = [&] {
     state ^= state << 13, state ^= state >> 17, state ^= state << 5;
@@ -47,14 +44,12 @@ inline Yuv420 makeYuv(int width, int height, bool noise = false) {
   };
   for (int r = 0; r < height; ++r)
     for (int c = 0; c < width; ++c)
-      img.y[static_cast<size_t>(r) * width + c] =
-          noise ? next() : clampByte(128 + 50 * std::sin(c / 23.0) + 40 * std::cos(r / 31.0) + 0.1 * (c - r));
+      img.y.push_back(noise ? next()
+                            : clampByte(128 + 50 * std::sin(c / 23.0) + 40 * std::cos(r / 31.0) + 0.1 * (c - r)));
   for (int r = 0; r < img.ch(); ++r)
     for (int c = 0; c < img.cw(); ++c) {
-      img.u[static_cast<size_t>(r) * img.cw() + c] =
-          noise ? next() : clampByte(128 + 40 * std::sin((c + r) / 19.0));
-      img.v[static_cast<size_t>(r) * img.cw() + c] =
-          noise ? next() : clampByte(120 + 35 * std::cos((c - 2 * r) / 27.0));
+      img.u.push_back(noise ? next() : clampByte(128 + 40 * std::sin((c + r) / 19.0)));
+      img.v.push_back(noise ? next() : clampByte(120 + 35 * std::cos((c - 2 * r) / 27.0)));
     }
   return img;
 }
@@ -93,15 +88,10 @@ struct Decoded {
   std::vector<uint8_t> pixels;
 };
 
-namespace detail {
 struct DecodeError {
   jpeg_error_mgr pub;
   std::jmp_buf jump;
 };
-[[noreturn]] inline void decodeErrorExit(j_common_ptr c) {
-  std::longjmp(reinterpret_cast<DecodeError*>(c->err)->jump, 1);
-}
-inline void silent(j_common_ptr) {}
 
 // Reads the header, then every scan line, into `d`. Only trivially destructible objects live in
 // this frame because the error hook longjmps back (the pixels belong to the caller's `d`).
@@ -110,8 +100,8 @@ inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Dec
   std::memset(&c, 0, sizeof c);
   DecodeError err;
   c.err = jpeg_std_error(&err.pub);
-  err.pub.error_exit = decodeErrorExit;
-  err.pub.output_message = silent;
+  err.pub.error_exit = [](j_common_ptr info) { std::longjmp(reinterpret_cast<DecodeError*>(info->err)->jump, 1); };
+  err.pub.output_message = [](j_common_ptr) {};  // silent
   if (setjmp(err.jump)) {
     jpeg_destroy_decompress(&c);
     return false;
@@ -143,33 +133,29 @@ inline bool decodeRaw(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space, Dec
   jpeg_destroy_decompress(&c);
   return true;
 }
-}  // namespace detail
 
 inline Decoded decodeJpeg(const std::vector<uint8_t>& jpeg, J_COLOR_SPACE space = JCS_YCbCr) {
   Decoded d;
-  d.ok = !jpeg.empty() && detail::decodeRaw(jpeg, space, &d);
+  d.ok = !jpeg.empty() && decodeRaw(jpeg, space, &d);
   return d;
 }
 
-// PSNR in dB of n samples a[i * aStep] against b[i * bStep] (infinite when equal).
-inline double psnr(const uint8_t* a, size_t aStep, const uint8_t* b, size_t bStep, size_t n) {
+// PSNR in dB of n samples of `a` against `b` (infinite when equal).
+inline double psnr(const uint8_t* a, const uint8_t* b, size_t n) {
   double sum = 0;
-  for (size_t i = 0; i < n; ++i) sum += std::pow(double(a[i * aStep]) - double(b[i * bStep]), 2);
+  for (size_t i = 0; i < n; ++i) sum += std::pow(double(a[i]) - double(b[i]), 2);
   return sum == 0 ? INFINITY : 10.0 * std::log10(255.0 * 255.0 * static_cast<double>(n) / sum);
 }
 
-// Luminance PSNR of a YCbCr decode against its source.
-inline double lumaPsnr(const Decoded& d, const Yuv420& img) {
-  return psnr(d.pixels.data(), 3, img.y.data(), 1, img.y.size());
-}
-
-// PSNR of chroma plane 1 (Cb) or 2 (Cr) over the source's samples: with replicated chroma the
-// decoded sample at (2x, 2y) is chroma sample (x, y).
-inline double chromaPsnr(const Decoded& d, const Yuv420& img, int plane) {
+// PSNR of component 0 (Y), 1 (Cb) or 2 (Cr) of a YCbCr decode against the source's plane: with
+// replicated chroma the decoded sample at (2x, 2y) is chroma sample (x, y).
+inline double planePsnr(const Decoded& d, const Yuv420& img, int plane) {
+  const int scale = plane == 0 ? 1 : 2;
+  const std::vector<uint8_t>& source = plane == 0 ? img.y : plane == 1 ? img.u : img.v;
   std::vector<uint8_t> decoded;
-  for (int y = 0; y < img.ch(); ++y)
-    for (int x = 0; x < img.cw(); ++x) decoded.push_back(d.pixels[(2 * y * d.width + 2 * x) * 3 + plane]);
-  return psnr(decoded.data(), 1, (plane == 1 ? img.u : img.v).data(), 1, decoded.size());
+  for (int y = 0; y < img.height / scale; ++y)
+    for (int x = 0; x < img.width / scale; ++x) decoded.push_back(d.pixels[scale * (y * d.width + x) * 3 + plane]);
+  return psnr(decoded.data(), source.data(), decoded.size());
 }
 
 }  // namespace jpeg_test

@@ -16,8 +16,8 @@
 
 #include <gtest/gtest.h>
 
+#include "support/DiagnosticsRecorder.h"
 #include "support/Fakes.h"
-#include "support/StdoutCapture.h"
 #include "vsearch/JpegEncoder.h"
 #include "vsearch/JpegTestSupport.h"
 
@@ -30,11 +30,9 @@ TEST(VisualSearchRequest, FixedPartsAreExact) {
             "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}");
   EXPECT_EQ(Tovra::visualSearchRequestId(1700000000, 17), "TovraStateEngine-1700000000-17");
   EXPECT_EQ(Tovra::visualSearchRequestId(0, UINT64_MAX), "TovraStateEngine-0-18446744073709551615");
-  // (orientation + 90) % 360 with the sign of the dividend, without overflow.
-  const int32_t orientations[] = {0, 90, 270, -90, -180, INT32_MAX, INT32_MIN};
-  const int32_t rotations[] = {90, 180, 0, 0, -90, static_cast<int32_t>((int64_t{INT32_MAX} + 90) % 360),
-                               static_cast<int32_t>((int64_t{INT32_MIN} + 90) % 360)};
-  for (size_t i = 0; i < 7; ++i) EXPECT_EQ(Tovra::visualSearchRotation(orientations[i]), rotations[i]);
+  // (orientation + 90) % 360 with the sign of the dividend, without overflow (2^31 + 89 leaves 217).
+  const int32_t cases[][2] = {{0, 90}, {90, 180}, {270, 0}, {-90, 0}, {-180, -90}, {INT32_MAX, 217}, {INT32_MIN, -38}};
+  for (const auto& c : cases) EXPECT_EQ(Tovra::visualSearchRotation(c[0]), c[1]) << c[0];
 }
 
 TEST(VisualSearchRequest, ReusedRequestKeepsFirstParamsAndLastQueryEntries) {
@@ -76,14 +74,11 @@ TEST(VisualSearchRequest, ReusedRequestKeepsFirstParamsAndLastQueryEntries) {
 
 using Tovra::ObjectInfo;
 
-struct Parsed {
-  bool ok = false;
-  std::vector<ObjectInfo> results;
-  Tovra::ResultMetadata metadata;
-};
+struct Parsed { bool ok = false; std::vector<ObjectInfo> results; Tovra::ResultMetadata metadata; };
 
-Parsed parse(const std::string& text) {
+Parsed parse(const std::string& text, size_t staleResults = 0) {
   Parsed p;
+  p.results.resize(staleResults);
   p.ok = Tovra::parseVisualSearchResponse(text, p.results, p.metadata);
   return p;
 }
@@ -152,8 +147,7 @@ TEST(VisualSearchResponseParser, MissingOrMistypedMembersFailAtTheirStep) {
               std::make_tuple(p.ok, p.metadata.queryID, p.metadata.mobileDecorator));
   }
   for (const std::string& text : std::vector<std::string>{
-           R"({"queryId":"q","quillmark":{"searchResult":[]}})",
-           R"({"queryId":"q","quillmark":{"resultMetadata":{}}})",
+           R"({"queryId":"q","quillmark":{"searchResult":[]}})", R"({"queryId":"q","quillmark":{"resultMetadata":{}}})",
            R"({"queryId":"q","quillmark":{"resultMetadata":{"finalAccumulation":"true"}}})",
            R"({"queryId":"q","quillmark":{"resultMetadata":{"finalAccumulation":true,"accumulatedQueries":[1]}}})",
            R"({"queryId":7,"quillmark":{}})", R"({"queryId":"q","quillmark":"text"})", R"(["queryId"])", "42",
@@ -171,10 +165,8 @@ TEST(VisualSearchResponseParser, HostileTextNeverThrowsOrOverflows) {
   static const char kNul[] = "{\"queryId\":\"a\0b\"}";
   for (const std::string& text : {std::string(""), std::string("not json"), std::string("{\"queryId\":\"q\""),
                                  std::string("{}garbage"), std::string("\xff\xfe"), std::string(kNul, sizeof kNul - 1)}) {
-    std::vector<ObjectInfo> results(3);
-    Tovra::ResultMetadata metadata;
-    EXPECT_FALSE(Tovra::parseVisualSearchResponse(text, results, metadata)) << text;
-    EXPECT_EQ(results.size(), 3u);  // untouched
+    const Parsed p = parse(text, 3);
+    EXPECT_TRUE(!p.ok && p.results.size() == 3u) << text;  // the results are left untouched
   }
   // Nesting beyond the limit is refused (properties are serialised recursively, subContent is
   // read recursively); up to the limit it is read, and brackets inside strings do not count.
@@ -221,10 +213,10 @@ class JobTest : public ::testing::Test {
   }
   // Runs the job on one frame; returns the id of the request it sent.
   std::string send(const std::shared_ptr<FrameRecord>& record) {
-    const size_t before = transport.sentCount();
+    const size_t before = transport.sent().size();
     job->setFrameRecord(record);
     job->run();
-    EXPECT_EQ(transport.sentCount(), before + 1);
+    EXPECT_EQ(transport.sent().size(), before + 1);
     EXPECT_EQ(job->state(), Tovra::AwaitingReply);
     return transport.sent().back().id;
   }
@@ -269,16 +261,16 @@ TEST_F(JobTest, EndsWithoutSendingWhenThereIsNothingSafeToSend) {
   shortYuv->pixels.resize(32 * 32);
   auto shortPacked = makeRecord(32, 32, OrzaVSMobile::BGRA);
   shortPacked->numChannels = 4;
-  StdoutCapture printed;
+  DiagnosticsRecorder diagnostics;
   for (const auto& bad : {shortYuv, shortPacked}) {
     job->setFrameRecord(bad);
     job->run();
     EXPECT_EQ(job->state(), Tovra::Finished);
   }
-  EXPECT_EQ(printed.text(),
+  EXPECT_EQ(diagnostics.text(),
             "Skipped frame 7: its pixels do not cover a 32x32 image\n"
             "Skipped frame 7: its pixels do not cover a 32x32 image\n");
-  EXPECT_EQ(transport.sentCount(), 0u);
+  EXPECT_EQ(transport.sent().size(), 0u);
 }
 
 TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
@@ -286,13 +278,13 @@ TEST_F(JobTest, ReportsErrorsAndFilteredResultsAndCarriesTheQueryOn) {
       {404, "not found", Tovra::Server::RESPONSE_SERVER_ERROR},
       {200, "{\"queryId\":", Tovra::Server::RESPONSE_PARSE_ERROR},
       {201, "{}", Tovra::Server::RESPONSE_SERVER_ERROR}};  // only 200 is success
-  StdoutCapture printed;
+  DiagnosticsRecorder diagnostics;
   std::string lines;
   for (const auto& f : failures) {
     transport.pushServerResponse(makeResponse(sendGray(), f.body, f.code));
     lines += std::string("VSS SERVER ERROR: response: ") + f.body + "\n";
   }
-  EXPECT_EQ(printed.text(), lines);
+  EXPECT_EQ(diagnostics.text(), lines);
   const std::vector<ErrorCall> errors = events.errors();
   ASSERT_EQ(errors.size(), 3u);
   for (size_t i = 0; i < 3; ++i) {

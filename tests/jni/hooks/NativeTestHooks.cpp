@@ -28,25 +28,22 @@ bool isAttached(JavaVM* vm) {
 }
 
 // Runs `call` on a new native thread and describes it, as a Java string: "detached-before;" or
-// "attached-before;", what `call` said, "threw=<type>:<what>;" if it threw, and
+// "attached-before;", what `call` said, "threw=<type>:<what>;" if it threw a std::exception, and
 // "detached-after" or "attached-after".
 template <class Call>
 jstring onNativeThread(JNIEnv* env, Call call) {
   JavaVM* vm = nullptr;
   env->GetJavaVM(&vm);
   std::string report;
-  std::thread worker([&] {
+  std::thread([&] {
     report += isAttached(vm) ? "attached-before;" : "detached-before;";
     try {
       report += call();
     } catch (const std::exception& e) {
       report += std::string("threw=") + typeid(e).name() + ":" + e.what() + ";";
-    } catch (...) {
-      report += "threw=unknown;";
     }
     report += isAttached(vm) ? "attached-after" : "detached-after";
-  });
-  worker.join();
+  }).join();
   return env->NewStringUTF(report.c_str());
 }
 
@@ -61,8 +58,7 @@ std::string fromJava(JNIEnv* env, jstring text) {
 }  // namespace
 
 // showMessage(message) on a native thread.
-ORZAVS_TEST_HOOK(jstring, showMessageOnNativeThread)(JNIEnv* env, jclass, jlong delegate,
-                                                     jstring message) {
+ORZAVS_TEST_HOOK(jstring, showMessageOnNativeThread)(JNIEnv* env, jclass, jlong delegate, jstring message) {
   auto* target = fromHandle<Tovra::EventDelegateBase>(delegate);
   const std::string text = fromJava(env, message);
   return onNativeThread(env, [&] {
@@ -73,8 +69,7 @@ ORZAVS_TEST_HOOK(jstring, showMessageOnNativeThread)(JNIEnv* env, jclass, jlong 
 
 // didDecode on a native thread with `count` results ("result-0", ...; contentType 10 with a
 // four-corner location) and metadata whose queryID is `queryId`.
-ORZAVS_TEST_HOOK(jstring, didDecodeOnNativeThread)(JNIEnv* env, jclass, jlong delegate, jint count,
-                                                   jstring queryId) {
+ORZAVS_TEST_HOOK(jstring, didDecodeOnNativeThread)(JNIEnv* env, jclass, jlong delegate, jint count, jstring queryId) {
   auto* target = fromHandle<Tovra::EventDelegateBase>(delegate);
   std::vector<Tovra::ObjectInfo> results;
   for (int i = 0; i < count; ++i) {
@@ -94,8 +89,7 @@ ORZAVS_TEST_HOOK(jstring, didDecodeOnNativeThread)(JNIEnv* env, jclass, jlong de
 }
 
 // sendServerRequest of a request with id `id` on a native thread, as the engine's worker does.
-ORZAVS_TEST_HOOK(jstring, sendRequestOnNativeThread)(JNIEnv* env, jclass, jlong delegate,
-                                                     jstring id) {
+ORZAVS_TEST_HOOK(jstring, sendRequestOnNativeThread)(JNIEnv* env, jclass, jlong delegate, jstring id) {
   auto* target = fromHandle<Tovra::Server::ServerDelegate>(delegate);
   Tovra::Server::ServerRequest request;
   request.id = fromJava(env, id);
@@ -105,8 +99,7 @@ ORZAVS_TEST_HOOK(jstring, sendRequestOnNativeThread)(JNIEnv* env, jclass, jlong 
 }
 
 // showMessage(message) on the calling Java thread; true when the thread is still attached after.
-ORZAVS_TEST_HOOK(jboolean, showMessageOnThisThread)(JNIEnv* env, jclass, jlong delegate,
-                                                    jstring message) {
+ORZAVS_TEST_HOOK(jboolean, showMessageOnThisThread)(JNIEnv* env, jclass, jlong delegate, jstring message) {
   auto* target = fromHandle<Tovra::EventDelegateBase>(delegate);
   target->showMessage(fromJava(env, message));
   // A Java exception raised by the callback is returned to Java by the library's own frame

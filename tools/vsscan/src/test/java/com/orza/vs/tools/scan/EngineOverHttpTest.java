@@ -3,38 +3,19 @@ package com.orza.vs.tools.scan;
 import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.tools.server.ReferenceServer;
-import java.io.IOException;
 import java.net.InetAddress;
 import java.net.ServerSocket;
 import java.util.HashSet;
 import java.util.List;
 import java.util.Set;
-import org.junit.jupiter.api.AfterAll;
-import org.junit.jupiter.api.BeforeAll;
+import java.util.stream.Collectors;
 import org.junit.jupiter.api.Test;
 
-/**
- * The engine, through the Java API, with the HTTP transport and the reference server on
- * loopback: products recognised in real requests, and every failure path ending in the right
- * didReceiveServerError instead of a hang.
- */
+/** The engine through the Java API, with the HTTP transport and the reference server on loopback. */
 class EngineOverHttpTest {
-  static ReferenceServer server;
+  static final ReferenceServer server = TestServers.shared();
 
-  @BeforeAll
-  static void start() throws IOException {
-    server = TestServers.start(3);
-  }
-
-  @AfterAll
-  static void stop() {
-    server.close();
-  }
-
-  /**
-   * Feeds the built-in scene at 30 fps in real time until {@code minRequests} requests were
-   * sent or the scene ends, then waits for the outcomes.
-   */
+  /** Feeds the built-in scene in real time until {@code minRequests} were sent, then waits for the outcomes. */
   static ScanLog scan(GeneratedSource source, String url, int minRequests, int readTimeoutMs) throws Exception {
     ScanLog log = new ScanLog();
     try (ScanEngine engine = new ScanEngine(log, url, 1000, readTimeoutMs, null)) {
@@ -74,8 +55,7 @@ class EngineOverHttpTest {
       for (int i = 0; i < 8; i++) box[i] = product.location[i];
       assertTrue(Truth.iou(box, truth.corners) > 0.8, "outline of request " + r.number + ": " + r.body);
       assertTrue(product.properties.startsWith("{\"boundingBox\":{\"blx\":"), product.properties);
-      assertEquals("SearchTerms", product.subContents.get(0).type);
-      assertEquals("ExternalResult", product.subContents.get(1).type);
+      assertEquals(List.of("SearchTerms", "ExternalResult"), product.subContents.stream().map(x -> x.type).collect(Collectors.toList()));
     }
     assertTrue(named >= requests.size() - 1, named + " of " + requests.size() + " requests named the product");
     // The engine chains queries (lastQueryId), so the server's sessions accumulate them; after
@@ -85,9 +65,7 @@ class EngineOverHttpTest {
     assertTrue(requests.get(2).finalAccumulation);
     assertFalse(requests.get(3).finalAccumulation);
     assertEquals(1, requests.get(3).accumulated.size());
-    for (ScanLog.FrameEntry f : log.frames()) {
-      assertTrue(f.points != null && f.pointCount() <= 50, "points of frame " + f.index);
-    }
+    for (ScanLog.FrameEntry f : log.frames()) assertTrue(f.points != null && f.pointCount() <= 50, "points of frame " + f.index);
   }
 
   @Test

@@ -34,15 +34,12 @@ class ReferenceServerTest {
   static Path tmp;
   static ReferenceServer server;
   static final List<String> log = Collections.synchronizedList(new ArrayList<>());
-  static BufferedImage coffee;
 
   /** A catalogue folder of three photographs, one with details in catalog.json. */
   @BeforeAll
   static void start() throws IOException {
-    File dir = tmp.resolve("catalog").toFile();
-    assertTrue(dir.mkdir());
-    coffee = BuiltInCatalog.photo("coffee.png");
-    ImageIO.write(coffee, "png", new File(dir, "coffee.png"));
+    File dir = Files.createDirectory(tmp.resolve("catalog")).toFile();
+    ImageIO.write(BuiltInCatalog.photo("coffee.png"), "png", new File(dir, "coffee.png"));
     ImageIO.write(BuiltInCatalog.photo("chelsea.png"), "jpg", new File(dir, "chelsea.jpeg"));
     ImageIO.write(BuiltInCatalog.photo("camera.png"), "png", new File(dir, "camera.png"));
     Files.writeString(new File(dir, "catalog.json").toPath(),
@@ -60,30 +57,29 @@ class ReferenceServerTest {
     server.close();
   }
 
-  /** A 640x480 JPEG: the table, and {@code product} drawn with {@code t} (corners tl, tr, br, bl to {@code corners}). */
-  static byte[] view(BufferedImage product, AffineTransform t, double[] corners) throws IOException {
+  /**
+   * A 640x480 JPEG of the table with a built-in {@code photo} (null: none) turned by {@code degrees}
+   * about the centre at {@code scale}; its corners tl, tr, br, bl as they land go to {@code corners}.
+   */
+  static byte[] view(String photo, double degrees, double scale, double[] corners) throws IOException {
     BufferedImage f = new BufferedImage(640, 480, BufferedImage.TYPE_INT_RGB);
     Graphics2D g = f.createGraphics();
     g.setRenderingHint(RenderingHints.KEY_INTERPOLATION, RenderingHints.VALUE_INTERPOLATION_BILINEAR);
     g.drawImage(BuiltInCatalog.background(), 0, 0, 640, 480, null);
-    if (product != null) {
-      g.drawImage(product, t, null);
-      int w = product.getWidth(), h = product.getHeight();
+    if (photo != null) {
+      BufferedImage p = BuiltInCatalog.photo(photo);
+      int w = p.getWidth(), h = p.getHeight();
+      AffineTransform t = AffineTransform.getTranslateInstance(320, 240);
+      t.rotate(Math.toRadians(degrees));
+      t.scale(scale, scale);
+      t.translate(-w / 2.0, -h / 2.0);
+      g.drawImage(p, t, null);
       t.transform(new double[] {0, 0, w, 0, w, h, 0, h}, 0, corners, 0, 4);
     }
     g.dispose();
     ByteArrayOutputStream out = new ByteArrayOutputStream();
     ImageIO.write(f, "jpg", out);
     return out.toByteArray();
-  }
-
-  /** Turned by {@code degrees} about the frame's centre, at {@code scale}. */
-  static AffineTransform pose(BufferedImage img, double degrees, double scale) {
-    AffineTransform t = AffineTransform.getTranslateInstance(320, 240);
-    t.rotate(Math.toRadians(degrees));
-    t.scale(scale, scale);
-    t.translate(-img.getWidth() / 2.0, -img.getHeight() / 2.0);
-    return t;
   }
 
   /** A multipart body with boundary "bnd": the fields that are not null, then the file. */
@@ -129,7 +125,7 @@ class ReferenceServerTest {
   void namesTheProductWithItsCornersInOrderAndChainsSessions() throws IOException {
     // Turned by 100 degrees: the product's top-left corner lands at the frame's top right.
     double[] expected = new double[8];
-    Object doc = search(view(coffee, pose(coffee, 100, 0.6), expected), null);
+    Object doc = search(view("coffee.png", 100, 0.6, expected), null);
     List<?> results = results(doc);
     assertEquals(1, results.size(), results.toString());
     Object pidn = results.get(0);
@@ -143,7 +139,7 @@ class ReferenceServerTest {
 
     // The next query of the chain accumulates and, at the limit of 2, is final.
     String q1 = (String) Json.member(doc, "queryId");
-    Object doc2 = search(view(coffee, pose(coffee, -20, 0.5), expected), q1);
+    Object doc2 = search(view("coffee.png", -20, 0.5, expected), q1);
     String q2 = (String) Json.member(doc2, "queryId");
     assertNotEquals(q1, q2);
     Object meta = Json.member(Json.member(doc2, "quillmark"), "resultMetadata");
@@ -155,15 +151,12 @@ class ReferenceServerTest {
   @Test
   void unknownImagesGetNoResultAndProductsWithoutDetailsGetDefaults() throws IOException {
     double[] c = new double[8];
-    BufferedImage astronaut = BuiltInCatalog.photo("astronaut.png"); // not in this catalogue
-    assertEquals(List.of(), results(search(view(astronaut, pose(astronaut, 10, 0.7), c), null)));
-    assertEquals(List.of(), results(search(view(null, null, null), null)));
-    BufferedImage cat = BuiltInCatalog.photo("chelsea.png");
-    List<?> r = results(search(view(cat, pose(cat, 0, 0.9), c), null));
+    assertEquals(List.of(), results(search(view("astronaut.png", 10, 0.7, c), null)), "not in this catalogue");
+    assertEquals(List.of(), results(search(view(null, 0, 0, null), null)));
+    List<?> r = results(search(view("chelsea.png", 0, 0.9, c), null));
     assertEquals("chelsea", Json.member(r.get(0), "content"));
-    List<?> sub = (List<?>) Json.member(r.get(0), "subContent");
-    assertEquals(1, sub.size(), "no link without one in the catalogue");
-    assertEquals("chelsea", Json.member(sub.get(0), "content"));
+    assertEquals("[{\"content\":\"chelsea\",\"contentType\":\"SearchTerms\",\"properties\":{}}]",
+        Json.write(Json.member(r.get(0), "subContent")), "the id as search terms, and no link without one in the catalogue");
   }
 
   @Test
@@ -184,8 +177,8 @@ class ReferenceServerTest {
   @Test
   void testHooksAndBadRequestsAnswerAsDocumented() throws IOException {
     // (That /test/slow delays and /test/notjson is not JSON: EngineOverHttpTest, through the engine.)
-    byte[] ok = form(PARAMS, null, view(null, null, null));
-    byte[] huge = view(null, null, null);
+    byte[] ok = form(PARAMS, null, view(null, 0, 0, null));
+    byte[] huge = view(null, 0, 0, null);
     for (int i = 0; i + 8 < huge.length; i++) { // a small file whose frame header claims 60000 x 60000
       if ((huge[i] & 0xff) == 0xff && (huge[i + 1] & 0xff) == 0xc0) {
         huge[i + 5] = huge[i + 7] = (byte) 0xea;
@@ -217,11 +210,10 @@ class ReferenceServerTest {
         new String[] {"--port", "8080", "--delay", "20", "--fail", "notjson", "--accumulate", "3", "--host", "::1"}, System.out);
     assertEquals(List.of(8080, 20, "notjson", 3, "::1"), List.of(o.port, o.delayMs, o.fail, o.accumulate, o.host));
     assertEquals(null, ReferenceServer.parseArgs(new String[] {"--help"}, System.out));
-    File notImages = tmp.resolve("empty").toFile();
-    assertTrue(notImages.mkdir());
-    Files.writeString(new File(notImages, "catalog.json").toPath(), "[1]");
+    Path notImages = Files.createDirectory(tmp.resolve("empty"));
+    Files.writeString(notImages.resolve("catalog.json"), "[1]");
     String[][] bad = {{"--port"}, {"--port", "x"}, {"--port", "70000"}, {"--fail", "404"}, {"--bogus"},
-        {"--catalog", tmp.resolve("missing").toString()}, {"--catalog", notImages.getPath()}};
+        {"--catalog", tmp.resolve("missing").toString()}, {"--catalog", notImages.toString()}};
     for (String[] args : bad) {
       IllegalArgumentException e = assertThrows(IllegalArgumentException.class, () -> ReferenceServer.parseArgs(args, System.out));
       assertFalse(e.getMessage().isEmpty(), String.join(" ", args));

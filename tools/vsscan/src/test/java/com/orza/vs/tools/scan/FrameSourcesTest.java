@@ -3,7 +3,6 @@ package com.orza.vs.tools.scan;
 import static org.junit.jupiter.api.Assertions.*;
 
 import java.awt.image.BufferedImage;
-import java.io.ByteArrayOutputStream;
 import java.io.File;
 import java.io.IOException;
 import java.nio.charset.StandardCharsets;
@@ -55,15 +54,9 @@ class FrameSourcesTest {
 
   /** A Y4M file in {@code dir}: the header line, then each frame after its FRAME line. */
   static File y4m(Path dir, String header, byte[]... frames) throws IOException {
-    ByteArrayOutputStream b = new ByteArrayOutputStream();
-    b.writeBytes((header + "\n").getBytes(StandardCharsets.US_ASCII));
-    for (byte[] f : frames) {
-      b.writeBytes("FRAME\n".getBytes(StandardCharsets.US_ASCII));
-      b.writeBytes(f);
-    }
-    File file = dir.resolve("v" + System.nanoTime() + ".y4m").toFile();
-    Files.write(file.toPath(), b.toByteArray());
-    return file;
+    StringBuilder b = new StringBuilder(header).append('\n');
+    for (byte[] f : frames) b.append("FRAME\n").append(new String(f, StandardCharsets.ISO_8859_1));
+    return Files.writeString(dir.resolve("v" + System.nanoTime() + ".y4m"), b, StandardCharsets.ISO_8859_1).toFile();
   }
 
   private static byte[] ramp(int n, int start) {
@@ -152,8 +145,7 @@ class FrameSourcesTest {
       s.next();
       assertThrows(IOException.class, s::next);
     }
-    File empty = tmp.resolve("empty").toFile();
-    assertTrue(empty.mkdir());
+    File empty = Files.createDirectory(tmp.resolve("empty")).toFile();
     assertThrows(IOException.class, () -> FileSources.open(empty, null, -1, 1));
   }
 

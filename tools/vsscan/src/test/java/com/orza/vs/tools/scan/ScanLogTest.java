@@ -3,7 +3,6 @@ package com.orza.vs.tools.scan;
 import static org.junit.jupiter.api.Assertions.*;
 
 import java.awt.image.BufferedImage;
-import java.io.ByteArrayOutputStream;
 import java.io.File;
 import java.io.IOException;
 import java.nio.file.Files;
@@ -53,13 +52,11 @@ class ScanLogTest {
 
   @Test
   void reportShowsAnnotatedFramesAndEscapesServerText() throws IOException {
-    BufferedImage img = new BufferedImage(160, 120, BufferedImage.TYPE_INT_RGB);
-    ByteArrayOutputStream jpeg = new ByteArrayOutputStream();
-    ImageIO.write(img, "jpg", jpeg);
+    byte[] jpeg = VsScan.jpeg(Yuv.toNv21(new BufferedImage(160, 120, BufferedImage.TYPE_INT_RGB), 0));
     ScanLog log = new ScanLog();
     log.frameIn(0, 0, 160, 120, 3);
     log.points(new float[] {10, 10, 50, 60});
-    log.requestSent("TovraStateEngine-9-3", Map.of("orientation", "90"), jpeg.toByteArray());
+    log.requestSent("TovraStateEngine-9-3", Map.of("orientation", "90"), jpeg);
     log.answered("TovraStateEngine-9-3", 200, "{}", 0.012);
     float[] box = {20, 30, 100, 30, 100, 90, 20, 90};
     log.decoded(List.of(new ScanLog.Result("BoundingBox", "<script>alert(1)</script>", "{}", box, null)), "q-1", true, List.of("q-0", "q-1"));

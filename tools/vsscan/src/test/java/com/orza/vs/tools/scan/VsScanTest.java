@@ -14,7 +14,6 @@ import java.nio.file.Path;
 import java.util.Arrays;
 import java.util.List;
 import java.util.Locale;
-import java.util.Random;
 import java.util.regex.Matcher;
 import java.util.regex.Pattern;
 import java.util.stream.Collectors;
@@ -101,25 +100,10 @@ class VsScanTest {
   }
 
   @Test
-  void failingServerMakesTheToolFail() {
-    Run r = run("--size", "160x120", "--frames", "8", "--no-pace", "--quiet", "--out", tmp.resolve("r").toString(),
-        "--server", TestServers.shared().baseUrl() + "/test/500");
-    assertEquals(1, r.status, r.out);
-    assertTrue(r.out.contains("vsscan: FAILED: "), r.out);
-    assertTrue(figure(r.out, "(\\d+) errors") >= 1, r.out);
-  }
-
-  @Test
   void aTruncatedVideoIsScannedUpToTheDamage() throws IOException {
-    int w = 96, h = 64;
-    Random rnd = new Random(9);
-    byte[][] frames = new byte[3][w * h * 3 / 2];
-    for (byte[] frame : frames) {
-      for (int k = 0; k < w * h; k++) frame[k] = (byte) (rnd.nextBoolean() ? 20 : 230);
-      Arrays.fill(frame, w * h, frame.length, (byte) 128);
-    }
-    frames[2] = Arrays.copyOf(frames[2], 100); // the third is cut short
-    File video = FrameSourcesTest.y4m(tmp, "YUV4MPEG2 W96 H64 F10:1 C420jpeg", frames);
+    GeneratedSource scene = new GeneratedSource(96, 64, 2, 10);
+    byte[] f0 = scene.next().data, f1 = scene.next().data;
+    File video = FrameSourcesTest.y4m(tmp, "YUV4MPEG2 W96 H64 F10:1 C420jpeg", f0, f1, Arrays.copyOf(f1, 100)); // the third is cut short
     Run r = run(video.getPath(), "--out", tmp.resolve("cut").toString(), "--no-progress");
     assertTrue(r.out.contains("truncated frame 2; the input ends here"), r.out);
     assertEquals(2, figure(r.out, "frames in +(\\d+)"));
@@ -128,7 +112,7 @@ class VsScanTest {
   }
 
   @Test
-  void badUsageAndInputsExitWithStatusTwo() {
+  void exitStatusIsTwoForBadUsageOrInputAndOneWhenRequestsFail() {
     for (String[] args : new String[][] {{"--frames"}, {"--size", "12"}, {"--bogus"}, {"a", "b"}}) {
       assertEquals(2, run(args).status, String.join(" ", args));
     }
@@ -138,5 +122,10 @@ class VsScanTest {
     Run help = run("--help");
     assertEquals(0, help.status);
     assertTrue(help.out.contains("usage: vsscan"));
+    Run failed = run("--size", "160x120", "--frames", "8", "--no-pace", "--quiet", "--out", tmp.resolve("r").toString(),
+        "--server", TestServers.shared().baseUrl() + "/test/500");
+    assertEquals(1, failed.status, failed.out);
+    assertTrue(failed.out.contains("vsscan: FAILED: "), failed.out);
+    assertTrue(figure(failed.out, "(\\d+) errors") >= 1, failed.out);
   }
 }

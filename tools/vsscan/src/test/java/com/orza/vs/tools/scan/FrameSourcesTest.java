@@ -95,16 +95,14 @@ class FrameSourcesTest {
       File f = y4m(tmp, h);
       assertThrows(IOException.class, () -> FileSources.open(f, null, -1, 1), h);
     }
-    File garbage = tmp.resolve("g.y4m").toFile();
-    Files.write(garbage.toPath(), new byte[10_000]); // no newline: header longer than allowed
+    File garbage = Files.write(tmp.resolve("g.y4m"), new byte[10_000]).toFile(); // no newline: header longer than allowed
     assertThrows(IOException.class, () -> FileSources.open(garbage, null, -1, 1));
   }
 
   @Test
   void rawStreamNeedsASizeAndIgnoresTrailingBytes() throws IOException {
-    File raw = tmp.resolve("cam.nv21").toFile();
     byte[] data = ramp(3 * 12 + 5, 0);
-    Files.write(raw.toPath(), data);
+    File raw = Files.write(tmp.resolve("cam.nv21"), data).toFile();
     IOException e = assertThrows(IOException.class, () -> FileSources.open(raw, null, -1, 1));
     assertTrue(e.getMessage().contains("--size"));
     try (FrameSource s = FileSources.open(raw, new int[] {4, 2}, -1, 1)) {

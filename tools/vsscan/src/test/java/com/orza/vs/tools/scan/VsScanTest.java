@@ -75,8 +75,7 @@ class VsScanTest {
 
   @Test
   void aFolderWithATruthIsMeasuredPerFile() throws IOException {
-    File dir = tmp.resolve("shots").toFile();
-    assertTrue(dir.mkdir());
+    File dir = Files.createDirectory(tmp.resolve("shots")).toFile();
     GeneratedSource scene = new GeneratedSource(640, 480, 10, 30); // two frames of each product
     StringBuilder truth = new StringBuilder("{");
     for (int i = 0; i < 10; i += 4) {

@@ -10,13 +10,15 @@ import java.awt.image.BufferedImage;
 import java.io.ByteArrayOutputStream;
 import java.io.File;
 import java.io.IOException;
-import java.io.InputStream;
-import java.io.OutputStream;
-import java.net.HttpURLConnection;
-import java.net.URL;
-import java.nio.charset.StandardCharsets;
+import java.net.URI;
+import java.net.http.HttpClient;
+import java.net.http.HttpRequest;
+import java.net.http.HttpRequest.BodyPublishers;
+import java.net.http.HttpResponse;
+import java.net.http.HttpResponse.BodyHandlers;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.time.Duration;
 import java.util.ArrayList;
 import java.util.Collections;
 import java.util.List;
@@ -28,6 +30,7 @@ import org.junit.jupiter.api.io.TempDir;
 
 /** The server over real HTTP on loopback, recognising a small catalogue folder. */
 class ReferenceServerTest {
+  static final HttpClient HTTP = HttpClient.newBuilder().version(HttpClient.Version.HTTP_1_1).build();
   static final String PARAMS = "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}";
 
   @TempDir
@@ -93,28 +96,18 @@ class ReferenceServerTest {
     return (s + "--bnd--\r\n").getBytes(ISO_8859_1);
   }
 
-  /** Status and body of one exchange. */
-  static Object[] send(String method, String path, byte[] body) throws IOException {
-    HttpURLConnection c = (HttpURLConnection) new URL(server.baseUrl() + path).openConnection();
-    c.setConnectTimeout(2000);
-    c.setReadTimeout(5000);
-    c.setRequestMethod(method);
-    if (body != null) {
-      c.setDoOutput(true);
-      c.setRequestProperty("Content-Type", "multipart/form-data; boundary=bnd");
-      try (OutputStream os = c.getOutputStream()) {
-        os.write(body);
-      }
-    }
-    int code = c.getResponseCode();
-    InputStream in = code >= 400 ? c.getErrorStream() : c.getInputStream();
-    return new Object[] {code, in == null ? "" : new String(in.readAllBytes(), StandardCharsets.UTF_8)};
+  /** One exchange; a body goes as multipart/form-data with boundary "bnd". */
+  static HttpResponse<String> send(String method, String path, byte[] body) throws Exception {
+    HttpRequest.Builder b = HttpRequest.newBuilder(URI.create(server.baseUrl() + path)).timeout(Duration.ofSeconds(5));
+    if (body != null) b.header("Content-Type", "multipart/form-data; boundary=bnd");
+    b.method(method, body == null ? BodyPublishers.noBody() : BodyPublishers.ofByteArray(body));
+    return HTTP.send(b.build(), BodyHandlers.ofString());
   }
 
-  static Object search(byte[] jpeg, String lastQueryId) throws IOException {
-    Object[] r = send("POST", "/vsearch", form(PARAMS, lastQueryId, jpeg));
-    assertEquals(200, r[0], (String) r[1]);
-    return Json.parse((String) r[1]);
+  static Object search(byte[] jpeg, String lastQueryId) throws Exception {
+    HttpResponse<String> r = send("POST", "/vsearch", form(PARAMS, lastQueryId, jpeg));
+    assertEquals(200, r.statusCode(), r.body());
+    return Json.parse(r.body());
   }
 
   static List<?> results(Object doc) {
@@ -122,7 +115,7 @@ class ReferenceServerTest {
   }
 
   @Test
-  void namesTheProductWithItsCornersInOrderAndChainsSessions() throws IOException {
+  void namesTheProductWithItsCornersInOrderAndChainsSessions() throws Exception {
     // Turned by 100 degrees: the product's top-left corner lands at the frame's top right.
     double[] expected = new double[8];
     Object doc = search(view("coffee.png", 100, 0.6, expected), null);
@@ -149,7 +142,7 @@ class ReferenceServerTest {
   }
 
   @Test
-  void unknownImagesGetNoResultAndProductsWithoutDetailsGetDefaults() throws IOException {
+  void unknownImagesGetNoResultAndProductsWithoutDetailsGetDefaults() throws Exception {
     double[] c = new double[8];
     assertEquals(List.of(), results(search(view("astronaut.png", 10, 0.7, c), null)), "not in this catalogue");
     assertEquals(List.of(), results(search(view(null, 0, 0, null), null)));
@@ -175,17 +168,13 @@ class ReferenceServerTest {
   }
 
   @Test
-  void testHooksAndBadRequestsAnswerAsDocumented() throws IOException {
+  void testHooksAndBadRequestsAnswerAsDocumented() throws Exception {
     // (That /test/slow delays and /test/notjson is not JSON: EngineOverHttpTest, through the engine.)
     byte[] ok = form(PARAMS, null, view(null, 0, 0, null));
-    byte[] huge = view(null, 0, 0, null);
-    for (int i = 0; i + 8 < huge.length; i++) { // a small file whose frame header claims 60000 x 60000
-      if ((huge[i] & 0xff) == 0xff && (huge[i + 1] & 0xff) == 0xc0) {
-        huge[i + 5] = huge[i + 7] = (byte) 0xea;
-        huge[i + 6] = huge[i + 8] = (byte) 0x60;
-        break;
-      }
-    }
+    byte[] huge = view(null, 0, 0, null); // a small file whose frame header (SOF0) claims 60000 x 60000
+    int sof = new String(huge, ISO_8859_1).indexOf("\u00ff\u00c0");
+    huge[sof + 5] = huge[sof + 7] = (byte) 0xea;
+    huge[sof + 6] = huge[sof + 8] = (byte) 0x60;
     Object[][] cases = {
         {"POST", "/test/500", ok, 500}, {"POST", "/test/notjson", ok, 200}, {"POST", "/test/slow/50", ok, 200},
         {"POST", "/test/slow/abc", ok, 404}, {"POST", "/test/nothing", ok, 404}, {"POST", "/elsewhere", ok, 404},
@@ -193,14 +182,14 @@ class ReferenceServerTest {
         {"POST", "/vsearch", form(PARAMS, null, null), 400}, {"POST", "/vsearch", form(null, null, new byte[10]), 400},
         {"POST", "/vsearch", form("{not json", null, new byte[10]), 400},
         {"POST", "/vsearch", form("{\"quillmark\":{}}", null, new byte[10]), 400},
-        {"POST", "/vsearch", form(PARAMS, null, "not an image".getBytes(StandardCharsets.UTF_8)), 415},
-        {"POST", "/vsearch", "garbage".getBytes(StandardCharsets.UTF_8), 400},
+        {"POST", "/vsearch", form(PARAMS, null, "not an image".getBytes(ISO_8859_1)), 415},
+        {"POST", "/vsearch", "garbage".getBytes(ISO_8859_1), 400},
         {"POST", "/vsearch", form(PARAMS, null, new byte[3 * 1024 * 1024]), 413}, {"POST", "/vsearch", form(PARAMS, null, huge), 413},
     };
     for (Object[] k : cases) {
-      Object[] r = send((String) k[0], (String) k[1], (byte[]) k[2]);
-      assertEquals(k[3], r[0], k[0] + " " + k[1] + ": " + r[1]);
-      if ((Integer) k[3] >= 400) assertTrue(Json.member(Json.parse((String) r[1]), "error") instanceof String, (String) r[1]);
+      HttpResponse<String> r = send((String) k[0], (String) k[1], (byte[]) k[2]);
+      assertEquals(k[3], r.statusCode(), k[0] + " " + k[1] + ": " + r.body());
+      if ((Integer) k[3] >= 400) assertTrue(Json.member(Json.parse(r.body()), "error") instanceof String, r.body());
     }
   }
 

@@ -3,6 +3,7 @@ package com.orza.vs.mobile.library.http;
 import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.tools.server.Multipart;
+import com.sun.net.httpserver.Headers;
 import com.sun.net.httpserver.HttpHandler;
 import com.sun.net.httpserver.HttpServer;
 import java.io.IOException;
@@ -35,14 +36,12 @@ class VisualSearchHttpClientTest {
   @Test
   void wireFormatIsTheMultipartFormTheServerReads() throws IOException {
     AtomicReference<byte[]> body = new AtomicReference<>();
-    AtomicReference<String> type = new AtomicReference<>();
-    AtomicReference<String> id = new AtomicReference<>();
+    AtomicReference<Headers> headers = new AtomicReference<>();
     byte[] jpeg = new byte[5000];
     for (int i = 0; i < jpeg.length; i++) jpeg[i] = (byte) (i * 7); // includes CR, LF and '-'
     String params = "{\"quillmark\":{\"file_list\":{\"p_img_1\":\"file\"},\"params\":{\"rotation\":\"90\"}}}";
     VisualSearchHttpClient.Exchange e = post(ex -> {
-      type.set(ex.getRequestHeaders().getFirst("Content-Type"));
-      id.set(ex.getRequestHeaders().getFirst("X-Request-Id"));
+      headers.set(ex.getRequestHeaders());
       body.set(ex.getRequestBody().readAllBytes());
       byte[] reply = "{\"ok\":\"\u00e9\"}".getBytes(StandardCharsets.UTF_8);
       ex.getResponseHeaders().set("Content-Type", "application/json; charset=utf-8");
@@ -55,8 +54,8 @@ class VisualSearchHttpClientTest {
     assertEquals(201, e.code);
     assertEquals("{\"ok\":\"\u00e9\"}", e.body);
     assertTrue(e.seconds > 0 && e.seconds < 2, "round trip in seconds: " + e.seconds);
-    assertEquals("TovraStateEngine-1-2  X: y", id.get());
-    Multipart m = Multipart.parse(body.get(), Multipart.boundaryOf(type.get()));
+    assertEquals("TovraStateEngine-1-2  X: y", headers.get().getFirst("X-Request-Id"));
+    Multipart m = Multipart.parse(body.get(), Multipart.boundaryOf(headers.get().getFirst("Content-Type")));
     assertEquals(Map.of("vsearch_params_json", params, "version", "0.6", "orientation", "90", "na%22me", "\u00fcmlaut"), m.fields);
     assertArrayEquals(jpeg, m.files.get("file"));
   }

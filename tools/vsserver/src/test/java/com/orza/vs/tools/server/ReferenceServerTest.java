@@ -169,7 +169,7 @@ class ReferenceServerTest {
 
   @Test
   void testHooksAndBadRequestsAnswerAsDocumented() throws Exception {
-    // (That /test/slow delays and /test/notjson is not JSON: EngineOverHttpTest, through the engine.)
+    // (That /test/slow delays: EngineOverHttpTest, through the engine's read timeout.)
     byte[] ok = form(PARAMS, null, view(null, 0, 0, null));
     byte[] huge = view(null, 0, 0, null); // a small file whose frame header (SOF0) claims 60000 x 60000
     int sof = new String(huge, ISO_8859_1).indexOf("\u00ff\u00c0");
@@ -191,6 +191,7 @@ class ReferenceServerTest {
       assertEquals(k[3], r.statusCode(), k[0] + " " + k[1] + ": " + r.body());
       if ((Integer) k[3] >= 400) assertTrue(Json.member(Json.parse(r.body()), "error") instanceof String, r.body());
     }
+    assertThrows(IllegalArgumentException.class, () -> Json.parse(send("POST", "/test/notjson", ok).body()), "/test/notjson is not JSON");
   }
 
   @Test

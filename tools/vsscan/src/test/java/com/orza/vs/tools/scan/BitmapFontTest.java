@@ -3,6 +3,7 @@ package com.orza.vs.tools.scan;
 import static org.junit.jupiter.api.Assertions.*;
 
 import java.awt.image.BufferedImage;
+import java.util.Arrays;
 import java.util.HashMap;
 import java.util.List;
 import java.util.Map;
@@ -27,19 +28,18 @@ class BitmapFontTest {
     return b.toString();
   }
 
+  private static long ink(String picture) {
+    return picture.chars().filter(c -> c == '#').count();
+  }
+
   @Test
   void everyPrintableCharacterHasItsOwnGlyphInsideItsCell() {
-    // Drawn alone with a margin of 2 around the cell: nothing may fall outside the 5x9 cell.
+    // Drawn on its 5x9 cell alone and with a margin of 2 around it: the margin gets no ink.
     Map<String, Character> seen = new HashMap<>();
     for (char c = '!'; c <= '~'; c++) {
-      String glyph = render(String.valueOf(c), BitmapFont.GLYPH_WIDTH + 4, BitmapFont.HEIGHT + 4, 2, 2, 1);
-      String[] rows = glyph.split("\n");
-      for (int y = 0; y < rows.length; y++) {
-        for (int x = 0; x < rows[y].length(); x++) {
-          boolean inCell = x >= 2 && x < 2 + BitmapFont.GLYPH_WIDTH && y >= 2 && y < 2 + BitmapFont.HEIGHT;
-          assertTrue(inCell || rows[y].charAt(x) == '.', "'" + c + "' spills out of its cell:\n" + glyph);
-        }
-      }
+      String glyph = render(String.valueOf(c), BitmapFont.GLYPH_WIDTH, BitmapFont.HEIGHT, 0, 0, 1);
+      String framed = render(String.valueOf(c), BitmapFont.GLYPH_WIDTH + 4, BitmapFont.HEIGHT + 4, 2, 2, 1);
+      assertEquals(ink(glyph), ink(framed), "'" + c + "' spills out of its cell:\n" + framed);
       assertTrue(glyph.contains("#"), "'" + c + "' draws nothing");
       Character twin = seen.put(glyph, c);
       assertEquals(null, twin, "'" + c + "' looks the same as '" + twin + "'");
@@ -57,24 +57,15 @@ class BitmapFontTest {
     assertEquals((text.length() * BitmapFont.ADVANCE - 1) * scale, w);
     String big = render(text, w + 20, h + 12, x, top, scale);
     String[] rows = big.split("\n");
-    int minX = Integer.MAX_VALUE, maxX = -1, minY = Integer.MAX_VALUE, maxY = -1;
-    for (int y = 0; y < rows.length; y++) {
-      for (int px = 0; px < rows[y].length(); px++) {
-        if (rows[y].charAt(px) != '#') continue;
-        minX = Math.min(minX, px);
-        maxX = Math.max(maxX, px);
-        minY = Math.min(minY, y);
-        maxY = Math.max(maxY, y);
-      }
-    }
-    assertEquals(x, minX);
-    assertEquals(x + w - 1, maxX);
-    assertEquals(top, minY);
-    assertEquals(top + h - 1, maxY);
+    int minX = Arrays.stream(rows).mapToInt(r -> r.indexOf('#')).filter(i -> i >= 0).min().getAsInt();
+    int maxX = Arrays.stream(rows).mapToInt(r -> r.lastIndexOf('#')).max().getAsInt();
+    int rowLength = w + 20 + 1; // with its '\n'
+    int minY = big.indexOf('#') / rowLength, maxY = big.lastIndexOf('#') / rowLength;
+    assertEquals(List.of(x, x + w - 1, top, top + h - 1), List.of(minX, maxX, minY, maxY));
 
     // Every font pixel becomes a solid scale x scale square: scale^2 times the ink of scale 1.
     String small = render(text, w / scale, h / scale, 0, 0, 1);
-    assertEquals(scale * scale * small.chars().filter(c -> c == '#').count(), big.chars().filter(c -> c == '#').count());
+    assertEquals(scale * scale * ink(small), ink(big));
   }
 
   @Test
@@ -87,10 +78,7 @@ class BitmapFontTest {
     int cw = w - 30;
     String[] cut = render(text, cw, h, -9, -5, scale).split("\n");
     for (int y = 0; y < h; y++) {
-      for (int px = 0; px < cw; px++) {
-        char expected = px + 9 < w && y + 5 < h ? whole[y + 5].charAt(px + 9) : '.';
-        assertEquals(expected, cut[y].charAt(px), "pixel " + px + "," + y);
-      }
+      assertEquals(y + 5 < h ? whole[y + 5].substring(9, 9 + cw) : ".".repeat(cw), cut[y], "row " + y);
     }
     // Far outside nothing is drawn and nothing throws, even where positions overflow an int: in
     // int arithmetic the second H here would wrap round to x = 3.

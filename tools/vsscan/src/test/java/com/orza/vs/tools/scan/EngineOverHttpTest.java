@@ -1,40 +1,21 @@
 package com.orza.vs.tools.scan;
 
+import static java.util.stream.Collectors.toList;
 import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.tools.server.ReferenceServer;
-import java.io.IOException;
 import java.net.InetAddress;
 import java.net.ServerSocket;
 import java.util.HashSet;
 import java.util.List;
 import java.util.Set;
-import org.junit.jupiter.api.AfterAll;
-import org.junit.jupiter.api.BeforeAll;
 import org.junit.jupiter.api.Test;
 
-/**
- * The engine, through the Java API, with the HTTP transport and the reference server on
- * loopback: products recognised in real requests, and every failure path ending in the right
- * didReceiveServerError instead of a hang.
- */
+/** The engine through the Java API, with the HTTP transport and the reference server on loopback. */
 class EngineOverHttpTest {
-  static ReferenceServer server;
+  static final ReferenceServer server = TestServers.shared();
 
-  @BeforeAll
-  static void start() throws IOException {
-    server = TestServers.start(3);
-  }
-
-  @AfterAll
-  static void stop() {
-    server.close();
-  }
-
-  /**
-   * Feeds the built-in scene at 30 fps in real time until {@code minRequests} requests were
-   * sent or the scene ends, then waits for the outcomes.
-   */
+  /** Feeds the built-in scene in real time until {@code minRequests} were sent, then waits for the outcomes. */
   static ScanLog scan(GeneratedSource source, String url, int minRequests, int readTimeoutMs) throws Exception {
     ScanLog log = new ScanLog();
     try (ScanEngine engine = new ScanEngine(log, url, 1000, readTimeoutMs, null)) {
@@ -74,20 +55,14 @@ class EngineOverHttpTest {
       for (int i = 0; i < 8; i++) box[i] = product.location[i];
       assertTrue(Truth.iou(box, truth.corners) > 0.8, "outline of request " + r.number + ": " + r.body);
       assertTrue(product.properties.startsWith("{\"boundingBox\":{\"blx\":"), product.properties);
-      assertEquals("SearchTerms", product.subContents.get(0).type);
-      assertEquals("ExternalResult", product.subContents.get(1).type);
+      assertEquals(List.of("SearchTerms", "ExternalResult"), product.subContents.stream().map(x -> x.type).collect(toList()));
     }
     assertTrue(named >= requests.size() - 1, named + " of " + requests.size() + " requests named the product");
-    // The engine chains queries (lastQueryId), so the server's sessions accumulate them; after
-    // a final reply the next query opens a new session.
+    // The engine chains queries (lastQueryId), so sessions of 3 accumulate them; after a final reply a new one opens.
     assertEquals(requests.get(0).queryId, requests.get(1).metadata.get("lastQueryId"));
-    assertEquals(2, requests.get(1).accumulated.size());
-    assertTrue(requests.get(2).finalAccumulation);
-    assertFalse(requests.get(3).finalAccumulation);
-    assertEquals(1, requests.get(3).accumulated.size());
-    for (ScanLog.FrameEntry f : log.frames()) {
-      assertTrue(f.points != null && f.pointCount() <= 50, "points of frame " + f.index);
-    }
+    assertEquals(List.of(1, 2, 3, 1), requests.stream().limit(4).map(r -> r.accumulated.size()).collect(toList()));
+    assertEquals(List.of(false, false, true, false), requests.stream().limit(4).map(r -> r.finalAccumulation).collect(toList()));
+    for (ScanLog.FrameEntry f : log.frames()) assertTrue(f.points != null && f.pointCount() <= 50, "points of frame " + f.index);
   }
 
   @Test
@@ -109,8 +84,7 @@ class EngineOverHttpTest {
       assertTrue((System.nanoTime() - t0) / 1e9 < 5, "no hang with " + c[0]);
       ScanLog.RequestEntry r = log.requests().get(0);
       assertTrue(r.isError(), "reported as an error: " + r.body);
-      assertEquals(c[2], r.errorStatus, (String) c[0]);
-      assertEquals(c[3], r.errorCode, (String) c[0]);
+      assertEquals(List.of(c[2], c[3]), List.of(r.errorStatus, r.errorCode), (String) c[0]);
     }
   }
 
@@ -133,9 +107,7 @@ class EngineOverHttpTest {
       }
       assertTrue(engine.awaitOutcomes(3000));
     }
-    List<ScanLog.RequestEntry> requests = log.requests();
-    assertEquals(2, requests.size());
-    for (ScanLog.RequestEntry r : requests) assertEquals(-3, r.errorCode, r.body);
+    assertEquals(List.of(-3, -3), log.requests().stream().map(r -> r.errorCode).collect(toList()));
     assertEquals(before + 1, server.requestCount(), "nothing is sent after close()");
   }
 }

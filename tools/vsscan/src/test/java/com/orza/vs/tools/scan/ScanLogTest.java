@@ -3,16 +3,13 @@ package com.orza.vs.tools.scan;
 import static org.junit.jupiter.api.Assertions.*;
 
 import java.awt.image.BufferedImage;
-import java.io.ByteArrayOutputStream;
 import java.io.File;
 import java.io.IOException;
-import java.nio.charset.StandardCharsets;
 import java.nio.file.Files;
 import java.nio.file.Path;
 import java.util.ArrayList;
-import java.util.Arrays;
-import java.util.Collections;
 import java.util.List;
+import java.util.Map;
 import javax.imageio.ImageIO;
 import org.junit.jupiter.api.Test;
 import org.junit.jupiter.api.io.TempDir;
@@ -23,26 +20,17 @@ class ScanLogTest {
   Path tmp;
 
   @Test
-  void frameIdsComeFromTheEndOfKeysAndRequestIds() {
+  void requestsFindTheirFrameAndReportsGoToTheRequestAnsweredOnTheSameThread() throws Exception {
     assertEquals(17, ScanLog.frameIdOf("TovraStateEngine-1700000000-17"));
-    assertEquals(17, ScanLog.frameIdOf("1700000000-17"));
-    assertEquals(-1, ScanLog.frameIdOf("no-number-here-x"));
-    assertEquals(-1, ScanLog.frameIdOf("plain"));
-    assertEquals(-1, ScanLog.frameIdOf(null));
-  }
-
-  @Test
-  void reportsGoToTheRequestAnsweredOnTheSameThread() throws Exception {
+    for (String none : new String[] {"no-number-here-x", "plain", null}) assertEquals(-1, ScanLog.frameIdOf(none), none);
     ScanLog log = new ScanLog();
     log.frameIn(0, 0.0, 64, 48, 5);
     log.points(new float[] {1, 2, 3, 4});
     log.frameIn(1, 0.033, 64, 48, 6);
-    ScanLog.RequestEntry a = log.requestSent("TovraStateEngine-1-5", Collections.emptyMap(), new byte[0]);
-    ScanLog.RequestEntry b = log.requestSent("TovraStateEngine-1-6", Collections.emptyMap(), new byte[0]);
-    assertEquals(0, a.frameIndex);
-    assertEquals(1, b.frameIndex);
-    assertEquals(2, log.frames().get(0).pointCount());
-    assertEquals(0, log.frames().get(1).pointCount());
+    ScanLog.RequestEntry a = log.requestSent("TovraStateEngine-1-5", Map.of(), new byte[0]);
+    ScanLog.RequestEntry b = log.requestSent("TovraStateEngine-1-6", Map.of(), new byte[0]);
+    assertEquals(List.of(0, 1), List.of(a.frameIndex, b.frameIndex));
+    assertEquals(List.of(2, 0), List.of(log.frames().get(0).pointCount(), log.frames().get(1).pointCount()));
 
     // b is answered first on another thread: its report must not land on the older a.
     Thread t = new Thread(() -> {
@@ -55,7 +43,7 @@ class ScanLogTest {
     assertEquals(500, b.errorCode);
     assertFalse(a.reported);
     // A report with no answer on this thread goes to the oldest open request.
-    assertSame(a, log.decoded(Collections.emptyList(), "q1", true, Arrays.asList("q1")));
+    assertSame(a, log.decoded(List.of(), "q1", true, List.of("q1")));
     assertEquals(0, log.openRequests());
     // A report with nothing open is counted, not attributed.
     log.serverError(2, 200);
@@ -64,31 +52,26 @@ class ScanLogTest {
 
   @Test
   void reportShowsAnnotatedFramesAndEscapesServerText() throws IOException {
-    BufferedImage img = new BufferedImage(160, 120, BufferedImage.TYPE_INT_RGB);
-    ByteArrayOutputStream jpeg = new ByteArrayOutputStream();
-    ImageIO.write(img, "jpg", jpeg);
+    byte[] jpeg = VsScan.jpeg(Yuv.toNv21(new BufferedImage(160, 120, BufferedImage.TYPE_INT_RGB), 0));
     ScanLog log = new ScanLog();
     log.frameIn(0, 0, 160, 120, 3);
     log.points(new float[] {10, 10, 50, 60});
-    log.requestSent("TovraStateEngine-9-3", Collections.singletonMap("orientation", "90"), jpeg.toByteArray());
+    log.requestSent("TovraStateEngine-9-3", Map.of("orientation", "90"), jpeg);
     log.answered("TovraStateEngine-9-3", 200, "{}", 0.012);
     float[] box = {20, 30, 100, 30, 100, 90, 20, 90};
-    log.decoded(Arrays.asList(new ScanLog.Result("BoundingBox", "<script>alert(1)</script>", "{}", box, null)), "q-1", true,
-        Arrays.asList("q-0", "q-1"));
-    log.requestSent("TovraStateEngine-9-4", Collections.emptyMap(), new byte[] {1, 2, 3}); // not a JPEG
+    log.decoded(List.of(new ScanLog.Result("BoundingBox", "<script>alert(1)</script>", "{}", box, null)), "q-1", true, List.of("q-0", "q-1"));
+    log.requestSent("TovraStateEngine-9-4", Map.of(), new byte[] {1, 2, 3}); // not a JPEG
     log.answered("TovraStateEngine-9-4", -1, "transport: no answer", 0.001);
     log.serverError(1, -1);
 
     File dir = tmp.toFile();
     File html = ReportWriter.write(dir, log, new Summary(log), null, new ReportWriter.Info());
-    String page = new String(Files.readAllBytes(html.toPath()), StandardCharsets.UTF_8);
+    String page = Files.readString(html.toPath());
     assertFalse(page.contains("<script>alert"), "server text must be escaped");
-    assertTrue(page.contains("&lt;script&gt;alert(1)&lt;/script&gt;"));
-    assertTrue(page.contains("frames/request-0001.png"));
-    assertTrue(page.contains("data:image/jpeg;base64,"), "thumbnails are inline");
-    assertTrue(page.contains("error: status 1, code -1"));
-    assertTrue(page.contains("<svg class=\"timeline\""));
-    assertTrue(page.contains("scan had problems"));
+    for (String part : new String[] {"&lt;script&gt;alert(1)&lt;/script&gt;", "frames/request-0001.png", "data:image/jpeg;base64,",
+        "error: status 1, code -1", "<svg class=\"timeline\"", "scan had problems"}) {
+      assertTrue(page.contains(part), part);
+    }
 
     BufferedImage annotated = ImageIO.read(new File(dir, "frames/request-0001.png"));
     assertEquals(160, annotated.getWidth());
@@ -112,7 +95,7 @@ class ScanLogTest {
       f.asked = true;
       frames.add(f);
       log.frameIn(i, i * 0.2, 64, 48, i);
-      log.requestSent("TovraStateEngine-1-" + i, Collections.emptyMap(), new byte[0]);
+      log.requestSent("TovraStateEngine-1-" + i, Map.of(), new byte[0]);
       float[] box = {10, 10, 30, 10, 30, i == 4 ? 20 : 30, 10, i == 4 ? 20 : 30}; // the cat's box covers half
       List<ScanLog.Result> got = table[i][1] == null ? List.of()
           : List.of(new ScanLog.Result("PIDN", (String) table[i][1], "{}", box, null));

@@ -1,23 +1,25 @@
 package com.orza.vs.tools.scan;
 
-import com.orza.vs.tools.server.BuiltInCatalog;
-import com.orza.vs.tools.server.Recognizer;
 import com.orza.vs.tools.server.ReferenceServer;
 import java.io.IOException;
+import java.io.UncheckedIOException;
 
-/** Reference servers for the suites, all sharing one index of the built-in catalogue. */
+/** The suites' reference server: quiet, on loopback, three queries per session, started once. */
 public final class TestServers {
-  private static Recognizer recognizer;
+  private static ReferenceServer shared;
 
   private TestServers() {}
 
-  /** A quiet loopback server with {@code accumulate} queries per session. */
-  public static synchronized ReferenceServer start(int accumulate) throws IOException {
-    if (recognizer == null) recognizer = new Recognizer(BuiltInCatalog.load());
+  public static synchronized ReferenceServer shared() {
+    if (shared != null) return shared;
     ReferenceServer.Options o = new ReferenceServer.Options();
     o.log = null;
-    o.accumulate = accumulate;
-    o.recognizer = recognizer;
-    return new ReferenceServer(o).start();
+    o.accumulate = 3;
+    try {
+      shared = new ReferenceServer(o).start();
+    } catch (IOException e) {
+      throw new UncheckedIOException(e);
+    }
+    return shared;
   }
 }

@@ -4,7 +4,6 @@ import static org.junit.jupiter.api.Assertions.*;
 
 import com.orza.vs.tools.server.BuiltInCatalog;
 import com.orza.vs.tools.server.Json;
-import com.orza.vs.tools.server.ReferenceServer;
 import java.io.ByteArrayOutputStream;
 import java.io.File;
 import java.io.IOException;
@@ -12,6 +11,7 @@ import java.io.PrintStream;
 import java.nio.charset.StandardCharsets;
 import java.nio.file.Files;
 import java.nio.file.Path;
+import java.util.Arrays;
 import java.util.List;
 import java.util.Locale;
 import java.util.regex.Matcher;
@@ -47,14 +47,10 @@ class VsScanTest {
     return Integer.parseInt(m.group(1));
   }
 
-  static String read(File f) throws IOException {
-    return new String(Files.readAllBytes(f.toPath()), StandardCharsets.UTF_8);
-  }
-
   @Test
   void builtInSceneIsRecognisedMeasuredAndReported() throws IOException {
-    File out = tmp.resolve("report").toFile();
-    Run r = run("--frames", "60", "--out", out.getPath(), "--no-progress");
+    Path out = tmp.resolve("report");
+    Run r = run("--frames", "60", "--out", out.toString(), "--no-progress");
     assertEquals(0, r.status, r.out);
     assertTrue(r.out.contains("vsscan: started the reference server at http://127.0.0.1:"), r.out);
     assertEquals(60, figure(r.out, "frames in +(\\d+)"));
@@ -68,9 +64,9 @@ class VsScanTest {
     assertTrue(Integer.parseInt(m.group(1)) >= sent - 2 && m.group(3).equals("0"), "recognised: " + m.group());
     assertTrue(Double.parseDouble(m.group(4)) > 0.8 && Double.parseDouble(m.group(5)) > 80, m.group());
 
-    String html = read(new File(out, "index.html"));
+    String html = Files.readString(out.resolve("index.html"));
     assertTrue(html.contains("scan succeeded") && html.contains("Recognition and frame choice") && html.contains("frames/request-0001.png"));
-    List<?> results = (List<?>) Json.parse(read(new File(out, "results.json")));
+    List<?> results = (List<?>) Json.parse(Files.readString(out.resolve("results.json")));
     assertEquals(sent, results.size());
     Object first = ((List<?>) Json.member(results.get(0), "results")).get(0);
     assertEquals("PIDN", Json.member(first, "contentType"));
@@ -79,8 +75,7 @@ class VsScanTest {
 
   @Test
   void aFolderWithATruthIsMeasuredPerFile() throws IOException {
-    File dir = tmp.resolve("shots").toFile();
-    assertTrue(dir.mkdir());
+    File dir = Files.createDirectory(tmp.resolve("shots")).toFile();
     GeneratedSource scene = new GeneratedSource(640, 480, 10, 30); // two frames of each product
     StringBuilder truth = new StringBuilder("{");
     for (int i = 0; i < 10; i += 4) {
@@ -91,44 +86,23 @@ class VsScanTest {
     }
     Files.writeString(new File(dir, "truth.json").toPath(), truth.append("\"absent.png\": {}}").toString());
     ImageIO.write(BuiltInCatalog.background(), "png", new File(dir, "table.png")); // no product, not listed
-    File out = tmp.resolve("shots-report").toFile();
-    Run r = run(dir.getPath(), "--out", out.getPath(), "--quiet");
+    Path out = tmp.resolve("shots-report");
+    Run r = run(dir.getPath(), "--out", out.toString(), "--quiet");
     assertEquals(0, r.status, r.out);
     assertTrue(r.out.contains("recognition: 4 of 4 requests named the right product (100.0%), 0 wrong, median box IoU 0."), r.out);
     assertTrue(r.out.contains("all frames 100.0% right"), r.out);
-    List<?> results = (List<?>) Json.parse(read(new File(out, "results.json")));
+    List<?> results = (List<?>) Json.parse(Files.readString(out.resolve("results.json")));
     assertEquals(List.of("shot0.png", "shot4.png", "shot8.png", "table.png"), results.stream().map(e -> Json.member(e, "file")).collect(Collectors.toList()));
     assertEquals(List.of(), Json.member(results.get(3), "results"));
     Files.writeString(new File(dir, "truth.json").toPath(), "{\"shot0.png\": {\"corners\": [1, 2]}}");
-    assertEquals(2, run(dir.getPath(), "--out", out.getPath(), "--quiet").status, "a bad truth.json is bad input");
-  }
-
-  @Test
-  void failingServerMakesTheToolFail() throws IOException {
-    try (ReferenceServer server = TestServers.start(5)) {
-      Run r = run("--size", "160x120", "--frames", "8", "--no-pace", "--quiet", "--out", tmp.resolve("r").toString(),
-          "--server", server.baseUrl() + "/test/500");
-      assertEquals(1, r.status, r.out);
-      assertTrue(r.out.contains("vsscan: FAILED: "), r.out);
-      assertTrue(figure(r.out, "(\\d+) errors") >= 1, r.out);
-    }
+    assertEquals(2, run(dir.getPath(), "--out", out.toString(), "--quiet").status, "a bad truth.json is bad input");
   }
 
   @Test
   void aTruncatedVideoIsScannedUpToTheDamage() throws IOException {
-    int w = 96, h = 64;
-    java.util.Random rnd = new java.util.Random(9);
-    ByteArrayOutputStream y4m = new ByteArrayOutputStream();
-    y4m.writeBytes(("YUV4MPEG2 W" + w + " H" + h + " F10:1 C420jpeg\n").getBytes(StandardCharsets.US_ASCII));
-    for (int i = 0; i < 3; i++) {
-      byte[] frame = new byte[w * h * 3 / 2];
-      for (int k = 0; k < w * h; k++) frame[k] = (byte) (rnd.nextBoolean() ? 20 : 230);
-      java.util.Arrays.fill(frame, w * h, frame.length, (byte) 128);
-      y4m.writeBytes("FRAME\n".getBytes(StandardCharsets.US_ASCII));
-      y4m.writeBytes(i < 2 ? frame : java.util.Arrays.copyOf(frame, 100)); // the third is cut short
-    }
-    File video = tmp.resolve("cut.y4m").toFile();
-    Files.write(video.toPath(), y4m.toByteArray());
+    GeneratedSource scene = new GeneratedSource(96, 64, 2, 10);
+    byte[] f0 = scene.next().data, f1 = scene.next().data;
+    File video = FrameSourcesTest.y4m(tmp, "YUV4MPEG2 W96 H64 F10:1 C420jpeg", f0, f1, Arrays.copyOf(f1, 100)); // the third is cut short
     Run r = run(video.getPath(), "--out", tmp.resolve("cut").toString(), "--no-progress");
     assertTrue(r.out.contains("truncated frame 2; the input ends here"), r.out);
     assertEquals(2, figure(r.out, "frames in +(\\d+)"));
@@ -137,16 +111,20 @@ class VsScanTest {
   }
 
   @Test
-  void badUsageAndInputsExitWithStatusTwo() {
-    assertEquals(2, run("--frames").status);
-    assertEquals(2, run("--size", "12").status);
-    assertEquals(2, run("--bogus").status);
-    assertEquals(2, run("a", "b").status);
+  void exitStatusIsTwoForBadUsageOrInputAndOneWhenRequestsFail() {
+    for (String[] args : new String[][] {{"--frames"}, {"--size", "12"}, {"--bogus"}, {"a", "b"}}) {
+      assertEquals(2, run(args).status, String.join(" ", args));
+    }
     Run missing = run(tmp.resolve("nothing-here").toString(), "--out", tmp.resolve("o").toString());
     assertEquals(2, missing.status);
     assertTrue(missing.out.contains("no such file or folder"), missing.out);
     Run help = run("--help");
     assertEquals(0, help.status);
     assertTrue(help.out.contains("usage: vsscan"));
+    Run failed = run("--size", "160x120", "--frames", "8", "--no-pace", "--quiet", "--out", tmp.resolve("r").toString(),
+        "--server", TestServers.shared().baseUrl() + "/test/500");
+    assertEquals(1, failed.status, failed.out);
+    assertTrue(failed.out.contains("vsscan: FAILED: "), failed.out);
+    assertTrue(figure(failed.out, "(\\d+) errors") >= 1, failed.out);
   }
 }

@@ -62,7 +62,8 @@ import java.util.List;
  * once, in one pass, into memory the engine lends for the frame. {@link #processNv21(byte[], int,
  * int, long)} takes an NV21 array (the old camera API's preview callback) or buffer, copied once
  * into the lent memory: while a query is out the engine keeps a copy of nearly every frame, and a
- * frame already in its memory needs none. Width and height must be even. The frame's memory must stay unchanged until the call returns, and not longer.
+ * frame already in its memory needs none. Width and height must be even. The frame's memory must
+ * stay unchanged until the call returns, and not longer.
  *
  * <p>Each process call returns whether the engine took the frame: false while the session is
  * not running (before {@link #start()}, while paused, after {@link #close()}) or when every

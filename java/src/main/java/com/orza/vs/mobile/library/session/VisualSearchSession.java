@@ -186,11 +186,9 @@ public final class VisualSearchSession implements AutoCloseable {
    * width x height x 3/2 bytes from its start; copied once into lent memory, like an array.
    */
   public boolean processNv21(ByteBuffer nv21, int width, int height, long timestampNanos) {
-    if (nv21 != null && !nv21.isDirect() && nv21.hasArray() && nv21.arrayOffset() == 0) {
-      return processNv21(nv21.array(), width, height, timestampNanos);
-    }
     if (nv21 == null) throw new NullPointerException("NV21 frame is null");
     if (!nv21.isDirect()) {
+      if (nv21.hasArray() && nv21.arrayOffset() == 0) return processNv21(nv21.array(), width, height, timestampNanos);
       throw new IllegalArgumentException("NV21 frame is neither a direct ByteBuffer nor array-backed");
     }
     int needed = nv21Bytes(nv21.capacity(), width, height);
